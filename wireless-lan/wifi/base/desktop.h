@@ -1,0 +1,26 @@
+// State notices to the desktop shell: text properties of the X11 root window.
+
+#ifndef WIFI_BASE_DESKTOP_H
+#define WIFI_BASE_DESKTOP_H
+
+#include <glib.h>
+
+// Values of "_NET_WIFI_CHANGE_STATUS".
+enum desktop_status : int {
+    STATUS_DISCONNECTED = 2,
+    STATUS_ASSOCIATED = 3, // or hosting an Ad-Hoc network
+    STATUS_CONNECTED = 4,
+    STATUS_SCANNING = 5
+};
+
+// Replaces the root-window property `atom_str` (type STRING, format 8) by `data` as decimal text.
+// It leaves at once, since a command that blocks the main loop may follow. NULL: nothing is done.
+void send_atom_to_desktop(const gchar *atom_str, int data);
+
+// Sends "_NET_WIFI_CHANGE_STATUS".
+void send_status_to_desktop(desktop_status status);
+
+// Idle job: tells the desktop the program's process id in "_NET_WIFI_STOP_CHECK". FALSE: run once.
+gboolean notice_desktop(gpointer data);
+
+#endif

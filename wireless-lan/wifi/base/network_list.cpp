@@ -1,0 +1,1 @@
+#include "base/network_list.h"

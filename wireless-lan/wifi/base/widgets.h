@@ -1,0 +1,58 @@
+// The named-widget registry on the main window, dialogs that any room may show, and the few widgets
+// that several rooms build alike.
+
+#ifndef WIFI_BASE_WIDGETS_H
+#define WIFI_BASE_WIDGETS_H
+
+#include <gtk/gtk.h>
+#include <libintl.h>
+
+#define _(text) gettext(text)
+#define N_(text) text
+
+// Registers `widget` on the main window under `key`. A later widget under the same key replaces it;
+// a widget that is destroyed leaves the registry by itself.
+void register_widget(GtkWidget *widget, const char *key);
+
+// The same, and gives the widget the key as its name.
+void register_named_widget(GtkWidget *widget, const char *key);
+
+// The widget under `key`, NULL when there is none (or no main window).
+GtkWidget *find_widget(const char *key);
+
+// Sets the sensitivity of the widget under `key`; a missing widget is skipped.
+void set_widget_sensitive(const char *key, gboolean sensitive);
+
+// Sets the status label of the main window; skipped while it does not exist.
+void set_title_label(const gchar *text);
+
+// Sets the label of the Connect button to a stock id; skipped while it does not exist.
+void set_connect_label(const gchar *stock);
+
+// TRUE when an access point address is neither empty nor all zeros.
+gboolean is_associated(const char *ap_address);
+
+// Runs a modal information box with one OK button over `parent` (may be NULL) until it is answered.
+void show_message_box(GtkWidget *parent, const gchar *message);
+
+// The same with one Close button.
+void show_warring_dialog(GtkWidget *parent, const gchar *message);
+
+// Runs `dialog` as gtk_dialog_run does. The caller keeps the dialog until end_dialog, even when it
+// is destroyed meanwhile with its parent; the answer is then GTK_RESPONSE_NONE.
+GtkWidget *begin_dialog(GtkWidget *dialog);
+void end_dialog(GtkWidget *dialog);
+
+// A combo of the texts "1" to "4" with the first one active.
+GtkWidget *create_normal_ComboBox();
+
+// `text` as valid UTF-8 for what GTK draws: the bytes that are none become U+FFFD. g_free it.
+gchar *displayable(const char *text);
+
+// A row's text of a column list, "" when the cell has none. The list owns it.
+const gchar *clist_text(GtkWidget *clist, gint row, gint column);
+
+// Logs GLib's failed-precondition message with a plain function name and the literal expression.
+void log_critical(const char *function, const char *expression);
+
+#endif

@@ -1,0 +1,1 @@
+#include "connection/add_to_preferred.h"

@@ -1,0 +1,1 @@
+#include "connection/encrypted_dialog.h"

@@ -1,0 +1,1 @@
+#include "connection/interface_state.h"

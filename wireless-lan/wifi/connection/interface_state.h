@@ -1,0 +1,21 @@
+// What the kernel says of an interface: its address, its access point, its link statistics.
+
+#ifndef WIFI_CONNECTION_INTERFACE_STATE_H
+#define WIFI_CONNECTION_INTERFACE_STATE_H
+
+#include "wifi.h"
+
+// Reads the access point of the first interface into Link_AP_MAC with SIOCGIWAP (linux/wireless.h);
+// it stays empty when the request fails.
+void get_ap_mac();
+
+// TRUE when the interface holds an IPv4 address (SIOCGIFADDR), whatever it is. NULL gives FALSE.
+gboolean address_valid(WIFI_INTERFACE *iface);
+
+// Reads the interface's IPv4 address into its `address`, which is emptied when it has none.
+void get_interface_statistics_data(WIFI_INTERFACE *iface);
+
+// Prints the interface's line of /proc/net/wireless to standard error; a diagnostic.
+void get_network_statics(WIFI_INTERFACE *iface);
+
+#endif

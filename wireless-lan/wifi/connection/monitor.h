@@ -1,0 +1,23 @@
+// The pollers that follow a connect from association to an address, and the controls they give back.
+
+#ifndef WIFI_CONNECTION_MONITOR_H
+#define WIFI_CONNECTION_MONITOR_H
+
+#include <glib.h>
+
+constexpr guint POLL_MS = 2000;
+
+// Sets the sensitivity of the main window's buttons; "Active WIFI" instead follows whether an
+// interface is missing.
+void connect_button_sensitive(gboolean flags);
+
+// Timer: waits for an access point, 21 polls at most, then requires an address and hands over.
+gboolean detect_network_link_state(gpointer data);
+
+// Timer: waits for an address, 21 polls at most.
+gboolean detect_network_interface_state(gpointer data);
+
+// One-shot timer: applies the network at connect_index and starts the link poller. Always FALSE.
+gboolean do_connect(gpointer data);
+
+#endif

@@ -1,0 +1,1 @@
+#include "preferred/add_dialog.h"

@@ -1,0 +1,1 @@
+#include "preferred/delete_dialog.h"

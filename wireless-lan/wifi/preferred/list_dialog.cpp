@@ -1,0 +1,5 @@
+#include "preferred/list_dialog.h"
+
+void cb_preferred_network_setting(GtkWidget *, gpointer)
+{
+}

@@ -1,0 +1,1 @@
+#include "preferred/network_form.h"

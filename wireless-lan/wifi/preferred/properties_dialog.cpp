@@ -1,0 +1,1 @@
+#include "preferred/properties_dialog.h"

@@ -1,0 +1,1 @@
+#include "settings/adhoc_dialog.h"

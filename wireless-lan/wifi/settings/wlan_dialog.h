@@ -1,0 +1,11 @@
+// The dialog with the addressing of the interface and the switch of Ad-Hoc hosting.
+
+#ifndef WIFI_SETTINGS_WLAN_DIALOG_H
+#define WIFI_SETTINGS_WLAN_DIALOG_H
+
+#include <gtk/gtk.h>
+
+// "clicked" of the main window's "WLAN Setting" button; runs the dialog, applies on OK.
+void cb_wifi_settings(GtkWidget *widget, gpointer data);
+
+#endif

@@ -1,0 +1,15 @@
+// Switching a built-in wireless module on.
+
+#ifndef WIFI_WINDOW_ACTIVATION_H
+#define WIFI_WINDOW_ACTIVATION_H
+
+#include <gtk/gtk.h>
+
+// "clicked" of "Active WIFI", and the first job after start: switches a built-in module on where no
+// interface is found, otherwise refreshes the list at once.
+void cb_active_device(GtkWidget *widget, gpointer data);
+
+// One-shot timer: looks for the interface again after the module was switched on.
+gboolean cb_check_wifi(gpointer data);
+
+#endif

@@ -1,0 +1,20 @@
+// The two halves of the main window.
+
+#ifndef WIFI_WINDOW_MAIN_WINDOW_H
+#define WIFI_WINDOW_MAIN_WINDOW_H
+
+#include <gtk/gtk.h>
+
+// The left half: the four buttons. The configuration is loaded while it is built.
+GtkWidget *create_left_text();
+
+// The right half: status label, network list, Connect button.
+GtkWidget *create_list();
+
+// Adds the five columns to a list view.
+void arrange_tree_view(GtkWidget *view);
+
+// A new empty model of five text columns. The caller owns it.
+GtkTreeModel *create_model();
+
+#endif

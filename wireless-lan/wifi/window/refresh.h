@@ -1,0 +1,14 @@
+// Scanning, matching the access point, filling the list.
+
+#ifndef WIFI_WINDOW_REFRESH_H
+#define WIFI_WINDOW_REFRESH_H
+
+#include <gtk/gtk.h>
+
+// "clicked" of the Refresh button; also called with two NULLs. Always FALSE.
+gboolean cb_refresh_network(GtkWidget *cb_widget, gpointer data);
+
+// One-shot timer: scans and fills the list. Always FALSE.
+gboolean cb_refresh(gpointer data);
+
+#endif

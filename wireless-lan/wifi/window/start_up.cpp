@@ -1,0 +1,1 @@
+#include "window/start_up.h"

@@ -1,0 +1,1 @@
+#include "wifi.h"
