@@ -43,8 +43,8 @@ struct _WIFI_CELL {
     char noise_level[16];
     char state[128]; // text of the list's "State" column
     char alias[128];
-    gint32 linkstate; // 1: the interface is associated with this network, 2: it is not
-    guint32 key_mgmt; // 0: WEP, 1: WPA
+    gint32 linkstate;  // 1: the interface is associated with this network, 2: it is not
+    guint32 key_mgmt;  // 0: WEP, 1: WPA
     guint32 key_index; // of the WEP key, from 0
 };
 typedef struct _WIFI_CELL WIFI_CELL;

@@ -1,1 +1,36 @@
 #include "base/network_list.h"
+
+#include "base/state.h"
+#include "base/widgets.h"
+
+void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, const gchar *Key,
+                    const gchar *Quality, const gchar *State)
+{
+    const gchar *texts[] = {ESSID, Mode, Key, Quality, State};
+    gchar *repaired[G_N_ELEMENTS(texts)] = {};
+
+    for (gsize i = 0; i < G_N_ELEMENTS(texts); i++)
+        if (!g_utf8_validate(texts[i], -1, nullptr))
+            texts[i] = repaired[i] = displayable(texts[i]);
+    gtk_list_store_insert_with_values(store, nullptr, -1, 0, texts[0], 1, texts[1], 2, texts[2], 3,
+                                      texts[3], 4, texts[4], -1);
+    for (gchar *text : repaired)
+        g_free(text);
+}
+
+void review_tree_vanpro(const gchar *data)
+{
+    GtkListStore *store = reinterpret_cast<GtkListStore *>(find_widget("cell-list"));
+
+    if (store == nullptr)
+        return;
+    gtk_list_store_clear(store);
+    for (int i = 0; i < my_wifi->cell_count; i++) {
+        WIFI_CELL *cell = my_wifi->wifi_cell[i];
+        const gboolean connected = i == connect_index;
+
+        copy_field(cell->state, sizeof cell->state, connected ? data : _("Disconnect"));
+        cell->linkstate = connected ? 1 : 2;
+        model_data_new(store, cell->essid, cell->mode, cell->key, cell->quality, cell->state);
+    }
+}

@@ -7,13 +7,13 @@
 
 #include "wifi.h"
 
-extern GtkWidget *mainwindow;        // set by main; NULL before and after its life
-extern gint connect_index;           // network the interface is with, -1: none; refresh, flow, commands
-extern gint pid_dhclient;            // kept for readers of the state, nothing sets it
-extern gboolean linkconnect;         // written by the link poller
-extern gboolean addressvalid;        // kept for readers of the state, nothing sets it
-extern gboolean doubleclick;         // a double click may connect; written by flow and the pollers
-extern gint user_wifi_count;         // rows of the preferred lists; written by the preferred rooms
+extern GtkWidget *mainwindow; // set by main; NULL before and after its life
+extern gint connect_index;    // network the interface is with, -1: none; refresh, flow, commands
+extern gint pid_dhclient;     // kept for readers of the state, nothing sets it
+extern gboolean linkconnect;  // written by the link poller
+extern gboolean addressvalid; // kept for readers of the state, nothing sets it
+extern gboolean doubleclick;  // a double click may connect; written by flow and the pollers
+extern gint user_wifi_count;  // rows of the preferred lists; written by the preferred rooms
 extern GtkWidget *global_build_list; // the front list of start-up; written by start_up
 extern gint boxspacing;              // padding of the settings' address rows, pixels
 extern int key_mgmt;                 // as last pre-filled by the encrypted dialog

@@ -1,1 +1,120 @@
 #include "connection/interface_state.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <initializer_list>
+
+#include <arpa/inet.h>
+#include <netinet/in.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+#include <unistd.h>
+// It brings linux/if.h along, which can't stand beside net/if.h.
+#include <linux/wireless.h>
+
+#include "base/state.h"
+
+static gboolean request_address(const char *name, struct ifreq *request)
+{
+    const int fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+
+    memset(request, 0, sizeof *request);
+    copy_field(request->ifr_name, sizeof request->ifr_name, name);
+    if (fd < 0)
+        return FALSE;
+
+    const gboolean answered = ioctl(fd, SIOCGIFADDR, request) == 0;
+    const int reason = errno;
+
+    close(fd);
+    errno = reason;
+    return answered;
+}
+
+void get_ap_mac()
+{
+    // Kept for the next poll: this runs every two seconds of a connect.
+    static int fd = -1;
+    const WIFI_INTERFACE *iface = first_interface();
+    struct iwreq request = {};
+
+    memset(Link_AP_MAC, 0, sizeof Link_AP_MAC);
+    if (iface == nullptr)
+        return;
+    if (fd < 0)
+        fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+    copy_field(request.ifr_name, sizeof request.ifr_name, iface->name);
+    if (ioctl(fd, SIOCGIWAP, &request) != 0)
+        return;
+
+    unsigned char mac[6];
+
+    memcpy(mac, request.u.ap_addr.sa_data, sizeof mac);
+    g_snprintf(Link_AP_MAC, sizeof Link_AP_MAC, "%02X:%02X:%02X:%02X:%02X:%02X", mac[0], mac[1],
+               mac[2], mac[3], mac[4], mac[5]);
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: Detect Linked Acess Pointer:%s\n", Link_AP_MAC);
+}
+
+gboolean address_valid(WIFI_INTERFACE *iface)
+{
+    struct ifreq request;
+
+    return iface != nullptr && request_address(iface->name, &request);
+}
+
+void get_interface_statistics_data(WIFI_INTERFACE *iface)
+{
+    struct ifreq request;
+
+    if (!request_address(iface->name, &request)) {
+        perror("ioctl");
+        iface->address[0] = '\0';
+        return;
+    }
+
+    struct sockaddr_in address;
+
+    memcpy(&address, &request.ifr_addr, sizeof address);
+    copy_field(iface->address, sizeof iface->address, inet_ntoa(address.sin_addr));
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: address:%s\n", iface->address);
+}
+
+static void print_statics(char *values)
+{
+    char *rest = nullptr;
+    const char *field = strtok_r(values, " \n", &rest);
+
+    if (field == nullptr)
+        return;
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: bp--->%s\n", field);
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: status=%x\n",
+            static_cast<unsigned>(strtoul(field, nullptr, 16)));
+    for (const char *label : {"link quality--->", "level=", "noise="}) {
+        field = strtok_r(nullptr, " \n", &rest);
+        if (field == nullptr)
+            return;
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s%d\n", label,
+                static_cast<int>(strtol(field, nullptr, 10)));
+    }
+}
+
+void get_network_statics(WIFI_INTERFACE *iface)
+{
+    FILE *list = fopen("/proc/net/wireless", "re");
+    const gsize length = strlen(iface->name);
+    char line[256];
+
+    if (list == nullptr)
+        return;
+    while (fgets(line, sizeof line, list) != nullptr) {
+        char *start = g_strchug(line);
+
+        if (strncmp(start, iface->name, length) == 0 && start[length] == ':') {
+            print_statics(start + length + 1);
+            break;
+        }
+    }
+    fclose(list);
+}

@@ -1,4 +1,5 @@
-// The pollers that follow a connect from association to an address, and the controls they give back.
+// The pollers that follow a connect from association to an address, and the controls they give
+// back.
 
 #ifndef WIFI_CONNECTION_MONITOR_H
 #define WIFI_CONNECTION_MONITOR_H

@@ -1,1 +1,65 @@
 #include "window/activation.h"
+
+#include <cstdio>
+#include <unistd.h>
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "window/refresh.h"
+
+static const char CHECKING_KEY[] = "window-proc-win";
+static const char MARKER_FILE[] = "/etc/build_in_wifi";
+// The module takes up to six seconds until its interface appears.
+static const guint POWER_ON_MS = 6050;
+
+static void show_checking_window()
+{
+    GtkWidget *window = gtk_window_new(GTK_WINDOW_POPUP);
+    GtkWidget *box = gtk_vbox_new(FALSE, 0);
+    GtkWidget *label = gtk_label_new(_("Checking,please wait..."));
+
+    register_named_widget(window, CHECKING_KEY);
+    run_command("echo 1 > /proc/kv/iwifi");
+    gtk_label_set_justify(GTK_LABEL(label), GTK_JUSTIFY_CENTER);
+    gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
+    gtk_container_add(GTK_CONTAINER(window), box);
+    gtk_window_set_position(GTK_WINDOW(window), GTK_WIN_POS_CENTER);
+    g_timeout_add(POWER_ON_MS, cb_check_wifi, nullptr);
+    gtk_widget_show_all(window);
+}
+
+void cb_active_device(GtkWidget *, gpointer)
+{
+    if (find_widget(CHECKING_KEY) != nullptr)
+        return;
+    if (access(MARKER_FILE, F_OK) == 0) {
+        get_interface();
+        if (my_wifi->interface_count < 1) {
+            show_checking_window();
+            return;
+        }
+    }
+    cb_refresh_network(nullptr, nullptr);
+}
+
+gboolean cb_check_wifi(gpointer)
+{
+    GtkWidget *window = find_widget(CHECKING_KEY);
+
+    printf("proc_win=%p\n", static_cast<void *>(window));
+    if (window != nullptr)
+        gtk_widget_destroy(window);
+
+    get_interface();
+    if (my_wifi->interface_count < 1) {
+        show_message_box(nullptr,
+                         _("Can not found any WIFI device.\nPlease confim that you have a WIFI "
+                           "device (either built-in or USB WIFI)."));
+        return FALSE;
+    }
+    if (find_widget("button-active-device") != nullptr) {
+        set_widget_sensitive("button-active-device", FALSE);
+        cb_refresh_network(nullptr, nullptr);
+    }
+    return FALSE;
+}

@@ -1,4 +1,93 @@
-int main()
+#include <cstdio>
+#include <cstdlib>
+
+#include <gtk/gtk.h>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "window/activation.h"
+#include "window/main_window.h"
+
+static const char TEXT_DOMAIN[] = "wireless-lan";
+// A window that is never exposed (started behind others) still gets its first scan.
+static const guint UNSEEN_MS = 1000;
+
+static void prepend_device_path()
 {
-    return 0;
+    const char *path = g_getenv("PATH");
+
+    if (PROGRAM_DEVICE_PATH[0] == '\0')
+        return;
+
+    g_autofree gchar *longer =
+        g_strconcat(PROGRAM_DEVICE_PATH, ":", path != nullptr ? path : "/bin:/usr/bin", nullptr);
+
+    g_setenv("PATH", longer, TRUE);
+}
+
+static void cb_leave(GtkWidget *, gpointer)
+{
+    mainwindow = nullptr;
+    gtk_main_quit();
+}
+
+static gboolean start_jobs(gpointer)
+{
+    static gboolean started = FALSE;
+
+    if (started)
+        return FALSE;
+    started = TRUE;
+    g_idle_add(
+        [](gpointer) -> gboolean {
+            cb_active_device(nullptr, nullptr);
+            return FALSE;
+        },
+        nullptr);
+    g_idle_add(notice_desktop, nullptr);
+    return FALSE;
+}
+
+// The jobs come after the first picture: the scan blocks the window. They are idle jobs of a lower
+// priority than drawing, so what this first exposure brings is drawn before they run.
+static gboolean cb_first_exposure(GtkWidget *widget, GdkEvent *, gpointer handler)
+{
+    g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_exposure),
+                                         handler);
+    start_jobs(nullptr);
+    return FALSE;
+}
+
+int main(int argc, char **argv)
+{
+    // In a pipe, too, a line leaves when it is written.
+    setvbuf(stdout, nullptr, _IOLBF, 0);
+    prepend_device_path();
+    bindtextdomain(TEXT_DOMAIN, PROGRAM_LOCALEDIR);
+    textdomain(TEXT_DOMAIN);
+    bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
+    gtk_init(&argc, &argv);
+    if (!my_wifi_init()) {
+        fputs("WIRELESS-LAN-DEBUG: my_wifi_init error!!!\r\n", stderr);
+        return EXIT_SUCCESS;
+    }
+
+    mainwindow = gtk_window_new(GTK_WINDOW_TOPLEVEL);
+    gtk_window_set_title(GTK_WINDOW(mainwindow), _("Wireless LAN"));
+    g_signal_connect(mainwindow, "destroy", G_CALLBACK(cb_leave), nullptr);
+    gtk_container_set_border_width(GTK_CONTAINER(mainwindow), 10);
+
+    GtkWidget *pane = gtk_hpaned_new();
+
+    gtk_container_add(GTK_CONTAINER(mainwindow), pane);
+    gtk_paned_add1(GTK_PANED(pane), create_left_text());
+    gtk_paned_add2(GTK_PANED(pane), create_list());
+
+    g_signal_connect(mainwindow, "expose-event", G_CALLBACK(cb_first_exposure), nullptr);
+    g_timeout_add(UNSEEN_MS, start_jobs, nullptr);
+    gtk_widget_show_all(mainwindow);
+    gtk_main();
+    return EXIT_SUCCESS;
 }

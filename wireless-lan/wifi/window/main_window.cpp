@@ -1,1 +1,111 @@
 #include "window/main_window.h"
+
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/flow.h"
+#include "preferred/list_dialog.h"
+#include "settings/wlan_dialog.h"
+#include "window/activation.h"
+#include "window/refresh.h"
+#include "window/start_up.h"
+
+static GtkWidget *new_scrolled_window()
+{
+    GtkWidget *scrolled = gtk_scrolled_window_new(nullptr, nullptr);
+
+    gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(scrolled), GTK_POLICY_AUTOMATIC,
+                                   GTK_POLICY_AUTOMATIC);
+    return scrolled;
+}
+
+static void add_button(GtkWidget *table, guint left, guint right, guint top, GtkWidget *button,
+                       const char *key, GCallback clicked)
+{
+    register_named_widget(button, key);
+    g_signal_connect(button, "clicked", clicked, nullptr);
+    gtk_table_attach_defaults(GTK_TABLE(table), button, left, right, top, top + 1);
+}
+
+GtkWidget *create_left_text()
+{
+    GtkWidget *scrolled = new_scrolled_window();
+    GtkWidget *frame = gtk_frame_new(_("Settings"));
+    GtkWidget *table = gtk_table_new(10, 2, TRUE);
+
+    gtk_widget_set_size_request(scrolled, 240, 300);
+    gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), frame);
+    gtk_frame_set_label_align(GTK_FRAME(frame), 0.0, 1.0);
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    gtk_widget_set_size_request(frame, 220, 300);
+    gtk_container_set_border_width(GTK_CONTAINER(frame), 10);
+    gtk_container_set_border_width(GTK_CONTAINER(table), 10);
+    gtk_container_add(GTK_CONTAINER(frame), table);
+
+    load_configuration();
+
+    add_button(table, 0, 2, 1, gtk_button_new_from_stock(GTK_STOCK_REFRESH), "button-refresh",
+               G_CALLBACK(cb_refresh_network));
+    add_button(table, 0, 2, 3, gtk_button_new_with_label(_("WLAN Setting")), "button-wifi-settings",
+               G_CALLBACK(cb_wifi_settings));
+    add_button(table, 0, 2, 5, gtk_button_new_with_label(_("Preferred Network")),
+               "button-network-configure", G_CALLBACK(cb_preferred_network_setting));
+    add_button(table, 0, 2, 7, gtk_button_new_with_label(_("Active WIFI")), "button-active-device",
+               G_CALLBACK(cb_active_device));
+    gtk_widget_show_all(scrolled);
+    return scrolled;
+}
+
+void arrange_tree_view(GtkWidget *view)
+{
+    const char *const titles[] = {_("ESSID"), _("Mode"), _("KEY"), _("Signal strength"),
+                                  _("State")};
+    GtkCellRenderer *renderer = gtk_cell_renderer_text_new();
+
+    g_object_set(renderer, "foreground", "DarkOliveGreen", nullptr);
+    for (gint column = 0; column < static_cast<gint>(G_N_ELEMENTS(titles)); column++)
+        gtk_tree_view_insert_column_with_attributes(GTK_TREE_VIEW(view), -1, titles[column],
+                                                    renderer, "text", column, nullptr);
+}
+
+GtkTreeModel *create_model()
+{
+    return GTK_TREE_MODEL(gtk_list_store_new(5, G_TYPE_STRING, G_TYPE_STRING, G_TYPE_STRING,
+                                             G_TYPE_STRING, G_TYPE_STRING));
+}
+
+GtkWidget *create_list()
+{
+    GtkWidget *scrolled = new_scrolled_window();
+    GtkWidget *box = gtk_vbox_new(FALSE, 10);
+    GtkWidget *label = gtk_label_new(_("Wireless network selection"));
+    GtkWidget *list_scrolled = new_scrolled_window();
+    GtkWidget *view = gtk_tree_view_new();
+    GtkTreeModel *model = create_model();
+    GtkWidget *table = gtk_table_new(1, 6, TRUE);
+
+    gtk_container_set_border_width(GTK_CONTAINER(box), 10);
+    gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), box);
+    gtk_widget_set_size_request(scrolled, 400, 500);
+
+    register_named_widget(label, "title-label");
+    gtk_misc_set_alignment(GTK_MISC(label), 0, 0);
+    gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
+
+    gtk_box_pack_start(GTK_BOX(box), list_scrolled, TRUE, TRUE, 0);
+    register_named_widget(view, "view-press");
+    gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(list_scrolled), view);
+    arrange_tree_view(view);
+    g_signal_connect(view, "button-press-event", G_CALLBACK(cb_view_sel), nullptr);
+
+    g_object_set_data(G_OBJECT(mainwindow), "cell-list", model);
+    gtk_tree_view_set_model(GTK_TREE_VIEW(view), model);
+    g_object_unref(model);
+    my_wifi->wifi_view = view;
+
+    add_button(table, 4, 6, 0, gtk_button_new_from_stock(GTK_STOCK_CONNECT), "button-connect",
+               G_CALLBACK(cb_connect));
+    gtk_box_pack_start(GTK_BOX(box), table, FALSE, FALSE, 0);
+    gtk_widget_show_all(scrolled);
+    return scrolled;
+}

@@ -1,1 +1,103 @@
 #include "window/refresh.h"
+
+#include <cstdio>
+#include <cstring>
+#include <initializer_list>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/interface_state.h"
+
+// Long enough for "Searching..." to be drawn before the scan blocks the window.
+static const guint SCAN_DELAY_MS = 100;
+
+gboolean cb_refresh_network(GtkWidget *, gpointer)
+{
+    fputs("WIRELESS-LAN-DEBUG: Searching...\n", stderr);
+    if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
+        for (const char *key : {"view-press", "button-connect", "button-refresh"})
+            set_widget_sensitive(key, FALSE);
+        set_title_label(_("Ad-Hoc Host Mode"));
+        return FALSE;
+    }
+
+    set_title_label(_("Searching..."));
+    get_interface();
+    printf("my_wifi->interface_count = %d\n", my_wifi->interface_count);
+    if (my_wifi->interface_count < 1) {
+        set_title_label(_("No Wireless Device"));
+        show_warring_dialog(mainwindow, _("No Wireless Device"));
+        fputs("WIRELESS-LAN-DEBUG: No interface\n", stderr);
+        return FALSE;
+    }
+
+    GtkListStore *store = reinterpret_cast<GtkListStore *>(find_widget("cell-list"));
+
+    if (store != nullptr)
+        gtk_list_store_clear(store);
+    for (const char *key : {"button-network-configure", "button-connect", "button-wifi-settings",
+                            "button-refresh", "view-press", "button-active-device"})
+        set_widget_sensitive(key, FALSE);
+    g_timeout_add(SCAN_DELAY_MS, cb_refresh, nullptr);
+    return FALSE;
+}
+
+// Sets connect_index to the last network whose access point is the one the interface is with, and
+// the status text that the list shows for it.
+static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize size)
+{
+    connect_index = -1;
+    g_strstrip(Link_AP_MAC);
+    for (int i = 0; i < my_wifi->cell_count; i++) {
+        WIFI_CELL *cell = my_wifi->wifi_cell[i];
+
+        cell->linkstate = 2;
+        if (strcmp(Link_AP_MAC, cell->address) != 0)
+            continue;
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: Match_AP_MAC:%s,address:%s\n", Link_AP_MAC,
+                cell->address);
+        cell->linkstate = 1;
+        connect_index = i;
+
+        g_autofree gchar *text =
+            iface->address[0] == '\0'
+                ? g_strdup(_("Connected\nIP address invalid"))
+                : g_strdup_printf("%s:%s", _("Connected\nIP Address"), iface->address);
+
+        copy_field(status, size, text);
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: connect_index[%d] BUFFER:%s\n", connect_index, status);
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: matched connect info:state [%d],essid:[%s]",
+                cell->linkstate, cell->essid);
+    }
+    if (connect_index == -1)
+        copy_field(status, size, _("Disconnect"));
+}
+
+gboolean cb_refresh(gpointer)
+{
+    WIFI_INTERFACE *iface = first_interface();
+    char status[STATUS_TEXT_SIZE] = "";
+
+    send_status_to_desktop(STATUS_SCANNING);
+    get_cell(iface);
+    for (const char *key : {"button-network-configure", "button-connect", "button-wifi-settings",
+                            "button-refresh", "view-press"})
+        set_widget_sensitive(key, TRUE);
+    set_widget_sensitive("button-active-device", FALSE);
+    my_wifi->cell_index = -1;
+    if (my_wifi->cell_count < 1) {
+        set_title_label(_("No Network"));
+        show_warring_dialog(mainwindow, _("No Network"));
+        set_title_label(_("Wireless network selection"));
+        return FALSE;
+    }
+
+    get_ap_mac();
+    get_interface_statistics_data(iface);
+    match_access_point(iface, status, sizeof status);
+    review_tree_vanpro(status);
+    set_title_label(_("Wireless network selection"));
+    return FALSE;
+}

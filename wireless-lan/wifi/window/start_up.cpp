@@ -1,1 +1,19 @@
 #include "window/start_up.h"
+
+#include <cstdio>
+
+#include "base/state.h"
+#include "preferred/store.h"
+#include "settings/apply.h"
+
+void load_configuration()
+{
+    get_interface();
+    if (my_wifi->interface_count > 0) {
+        bring_interface_up(first_interface()->name);
+        fputs("WIRELESS-LAN-DEBUG: find a wifi device,up it\n", stderr);
+    }
+    get_basic_setting_from_file(SETTINGS_FILE);
+    get_preferred_network_setting_from_file(USER_FILE);
+    global_build_list = build_user_cell_clist();
+}
