@@ -18,9 +18,24 @@ void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, 
         g_free(text);
 }
 
+static GtkListStore *cell_list()
+{
+    if (mainwindow == nullptr)
+        return nullptr;
+    return static_cast<GtkListStore *>(g_object_get_data(G_OBJECT(mainwindow), "cell-list"));
+}
+
+void clear_network_list()
+{
+    GtkListStore *store = cell_list();
+
+    if (store != nullptr)
+        gtk_list_store_clear(store);
+}
+
 void review_tree_vanpro(const gchar *data)
 {
-    GtkListStore *store = reinterpret_cast<GtkListStore *>(find_widget("cell-list"));
+    GtkListStore *store = cell_list();
 
     if (store == nullptr)
         return;

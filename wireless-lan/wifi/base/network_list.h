@@ -9,6 +9,9 @@
 void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, const gchar *Key,
                     const gchar *Quality, const gchar *State);
 
+// Removes all rows.
+void clear_network_list();
+
 // Fills the list afresh from the scanned networks: `data` (up to 127 bytes) is the state of the
 // network at connect_index, every other one is disconnected. Nothing is selected afterwards.
 void review_tree_vanpro(const gchar *data);

@@ -33,10 +33,7 @@ gboolean cb_refresh_network(GtkWidget *, gpointer)
         return FALSE;
     }
 
-    GtkListStore *store = reinterpret_cast<GtkListStore *>(find_widget("cell-list"));
-
-    if (store != nullptr)
-        gtk_list_store_clear(store);
+    clear_network_list();
     for (const char *key : {"button-network-configure", "button-connect", "button-wifi-settings",
                             "button-refresh", "view-press", "button-active-device"})
         set_widget_sensitive(key, FALSE);
