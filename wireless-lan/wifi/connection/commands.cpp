@@ -1,1 +1,169 @@
 #include "connection/commands.h"
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+#include <net/if.h>
+#include <netinet/in.h>
+#include <sys/ioctl.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+
+static const char ESSID_FILE[] = "/tmp/essid_tmp";
+static const char KEY_FILE[] = "/tmp/key_tmp";
+
+const char *encryption_word(t_encmode encmode)
+{
+    switch (encmode) {
+    case ENC_OFF:
+        return "off";
+    case ENC_OPEN:
+        return "open";
+    case ENC_RESTRICTED:
+        break;
+    }
+    return "restricted";
+}
+
+const char *client_mode(const char *mode)
+{
+    return g_ascii_strcasecmp(mode, "Master") == 0 ? "Managed" : mode;
+}
+
+const char *key_word(const WIFI_CELL *cell)
+{
+    return cell->userkey[0] == '\0' ? "off" : cell->userkey;
+}
+
+gchar *iwset_command(const char *name, const WIFI_CELL *cell)
+{
+    g_autofree gchar *essid = shell_escape(cell->essid);
+    g_autofree gchar *mode = shell_escape(client_mode(cell->mode));
+    g_autofree gchar *key = shell_escape(key_word(cell));
+    const char *enc = encryption_word(cell->encmode);
+
+    if (cell->key_mgmt == 0)
+        return g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\""
+                               " \"[%d]\"",
+                               name, essid, mode, key, enc, static_cast<int>(cell->key_index + 1));
+    // The two blanks are part of the line that the device's log watchers know.
+    return g_strdup_printf("/sbin/iwset  wpa \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
+                           name, essid, mode, key, enc);
+}
+
+void leave_text_for_scripts(const char *text, const char *path, guint mode)
+{
+    // mknod makes a plain file as open(O_EXCL) does, and needs no descriptor.
+    unlink(path);
+    if (mknod(path, S_IFREG | mode, 0) != 0) {
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s is not written: %s\n", path, g_strerror(errno));
+        return;
+    }
+
+    g_autofree gchar *command = echo_command(text, path);
+
+    run_command(command);
+}
+
+// Sets the interface's address to 0.0.0.0, so that the one of the former network is not taken for
+// an answer of the new one.
+static void clear_address(const char *name)
+{
+    const int fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+    struct ifreq request = {};
+
+    if (fd < 0)
+        return;
+    copy_field(request.ifr_name, sizeof request.ifr_name, name);
+    if (ioctl(fd, SIOCGIFADDR, &request) != 0) {
+        perror("ioctl");
+    } else {
+        struct sockaddr_in address;
+
+        memcpy(&address, &request.ifr_addr, sizeof address);
+        address.sin_addr.s_addr = htonl(INADDR_ANY);
+        memcpy(&request.ifr_addr, &address, sizeof address);
+        ioctl(fd, SIOCSIFADDR, &request);
+    }
+    close(fd);
+}
+
+void apply_configuration()
+{
+    const WIFI_INTERFACE *iface = first_interface();
+    const WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (my_wifi->interface_count <= 0 || iface == nullptr || cell == nullptr)
+        return;
+    if (!interface_usable(iface->name, "joining the network"))
+        return;
+
+    bring_interface_up(iface->name);
+    clear_address(iface->name);
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: essid to set:%s\n", cell->essid);
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: interface:%s\n", iface->name);
+
+    g_autofree gchar *command = iwset_command(iface->name, cell);
+
+    if (cell->key_mgmt == 0)
+        printf("iwset cmd=%s\r\n", command);
+    else
+        printf("wpa_supplicant cmd=%s\r\n", command);
+    leave_text_for_scripts(cell->essid, ESSID_FILE, 0666);
+    leave_text_for_scripts(key_word(cell), KEY_FILE, 0600);
+    run_command(command);
+}
+
+gboolean require_ip_address()
+{
+    const WIFI_INTERFACE *iface = first_interface();
+
+    if (iface == nullptr || !interface_usable(iface->name, "requiring an address"))
+        return FALSE;
+
+    const pid_t child = fork();
+
+    if (child == 0) {
+        // The script goes to init when its parent, this child, leaves: no zombie stays behind it.
+        if (fork() == 0)
+            execl("/sbin/lnk-ifup", "lnk-ifup", iface->name, nullptr);
+        // Not exit(): the text that waits in stdio's buffers is the parent's to print.
+        _exit(0);
+    }
+    if (child < 0)
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: fork PID %d error %d\n", child, errno);
+
+    const pid_t reaped = child > 0 ? waitpid(child, nullptr, 0) : -1;
+
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: wait fPID=%d,exPID=%d\n", child, reaped);
+    return FALSE;
+}
+
+gboolean do_disconnect(gpointer)
+{
+    const WIFI_INTERFACE *iface = first_interface();
+
+    if (iface != nullptr && interface_usable(iface->name, "leaving the network")) {
+        g_autofree gchar *command = g_strdup_printf("/sbin/lnk-ifdown %s", iface->name);
+
+        run_command(command);
+    }
+    send_status_to_desktop(STATUS_DISCONNECTED);
+    review_tree_vanpro(_("Disconnect"));
+
+    WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (cell != nullptr)
+        cell->linkstate = 2;
+    set_connect_label(GTK_STOCK_CONNECT);
+    connect_index = -1;
+    return FALSE;
+}

@@ -10,20 +10,26 @@
 // The command line for /sbin/iwset that joins `cell` on the interface `name`. g_free it.
 gchar *iwset_command(const char *name, const WIFI_CELL *cell);
 
-// The word /sbin/iwset takes for an encryption: "off", "open" or (any other value) "restricted".
+// The key that the device is told for `cell`: "off" where it has none. The cell owns it.
+const char *key_word(const WIFI_CELL *cell);
+
+// The word that /sbin/iwset takes for an encryption: "off", "open" or (any other value)
+// "restricted".
 const char *encryption_word(t_encmode encmode);
 
-// The mode /sbin/iwset and the preferred networks take: "Managed" for "Master" in any case, else
-// `mode` itself.
+// The mode that /sbin/iwset and the preferred networks take: "Managed" for "Master" in any case,
+// else `mode` itself.
 const char *client_mode(const char *mode);
 
-// Applies the network at connect_index to the first interface: brings it up, clears its address,
-// leaves name and key in /tmp for the device's scripts and runs /sbin/iwset.
-void apply_configuration();
-
-// Leaves `text` and a line end in the file `path` below /tmp for the device's scripts; a link
-// planted there is removed, not followed. `mode` are the permissions of the new file.
+// Leaves `text` and a line end in the file `path` for the device's scripts, created anew with the
+// permissions `mode` (less the umask): a link planted under the name is removed, not followed. When
+// the file cannot be made anew nothing is written and standard error has the cause.
 void leave_text_for_scripts(const char *text, const char *path, guint mode);
+
+// Applies the network at connect_index to the first interface: brings it up, clears its address,
+// leaves name and key in /tmp for the device's scripts and runs /sbin/iwset. Does nothing without
+// an interface or a network.
+void apply_configuration();
 
 // Starts "/sbin/lnk-ifup" for the first interface, detached: nobody's child. Always FALSE.
 gboolean require_ip_address();

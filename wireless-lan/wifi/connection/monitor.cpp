@@ -1,1 +1,163 @@
 #include "connection/monitor.h"
+
+#include <cstdio>
+#include <cstring>
+#include <initializer_list>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/commands.h"
+#include "connection/interface_state.h"
+
+static const int POLL_LIMIT = 21;
+
+void connect_button_sensitive(gboolean flags)
+{
+    for (const char *key :
+         {"button-network-configure", "button-connect", "button-wifi-settings", "button-refresh"})
+        set_widget_sensitive(key, flags);
+    get_interface();
+    set_widget_sensitive("button-active-device", my_wifi->interface_count == 0);
+}
+
+static gboolean same_network(const WIFI_CELL *a, const WIFI_CELL *b)
+{
+    return strcmp(a->address, b->address) == 0 && strcmp(a->essid, b->essid) == 0;
+}
+
+gboolean take_up_network(const WIFI_CELL *chosen)
+{
+    int index = connect_index;
+    WIFI_CELL *cell = scanned_cell(index);
+
+    // One access point can stand in the list twice, so the index in hand goes first.
+    if (cell == nullptr || !same_network(cell, chosen)) {
+        for (index = 0; (cell = scanned_cell(index)) != nullptr; index++)
+            if (same_network(cell, chosen))
+                break;
+        if (cell == nullptr)
+            return FALSE;
+    }
+    connect_index = index;
+    cell->encmode = chosen->encmode;
+    cell->key_mgmt = chosen->key_mgmt;
+    cell->key_index = chosen->key_index;
+    memcpy(cell->userkey, chosen->userkey, sizeof cell->userkey);
+    return TRUE;
+}
+
+static void show_address()
+{
+    WIFI_INTERFACE *iface = first_interface();
+
+    get_interface_statistics_data(iface);
+
+    g_autofree gchar *status = g_strdup_printf("%s:%s", _("Connected\nIP Address"), iface->address);
+
+    review_tree_vanpro(status);
+}
+
+// The end of every chain that reached an access point.
+static void give_controls_back()
+{
+    connect_button_sensitive(TRUE);
+    doubleclick = TRUE;
+}
+
+gboolean detect_network_interface_state(gpointer)
+{
+    static int count = 0; // shared by all chains
+    const WIFI_INTERFACE *iface = first_interface();
+
+    fputs("WIRELESS-LAN-DEBUG: detect_network_interface_state ...\n", stderr);
+    if (address_valid(first_interface())) {
+        count = 0;
+        fputs("WIRELESS-LAN-DEBUG: acquire address successed.\n", stderr);
+        send_status_to_desktop(STATUS_CONNECTED);
+        set_title_label(_("Wireless network selection"));
+        show_address();
+        set_connect_label(GTK_STOCK_DISCONNECT);
+        give_controls_back();
+        return FALSE;
+    }
+    if (++count < POLL_LIMIT)
+        return TRUE;
+    count = 0;
+    // The host of an Ad-Hoc network has the address it gave itself.
+    if (iface != nullptr && iface->wifi_group_enable)
+        return FALSE;
+
+    fputs("WIRELESS-LAN-DEBUG: acquire address failed.\n", stderr);
+    review_tree_vanpro(_("Connected\nIP address invalid"));
+    set_title_label(_("Wireless network selection"));
+
+    const WIFI_CELL *selected = scanned_cell(my_wifi->cell_index);
+
+    if (selected != nullptr && is_associated(selected->address))
+        set_connect_label(GTK_STOCK_DISCONNECT);
+    give_controls_back();
+    return FALSE;
+}
+
+static void acquire_address()
+{
+    linkconnect = TRUE;
+    send_status_to_desktop(STATUS_ASSOCIATED);
+    fputs("WIRELESS-LAN-DEBUG: link connected,then we will require ip address.\n", stderr);
+    review_tree_vanpro(_("Connected\nAcquire IP address..."));
+    set_title_label(_("Connected\nAcquire IP address..."));
+    require_ip_address();
+    g_timeout_add(POLL_MS, detect_network_interface_state, nullptr);
+}
+
+static void give_up_link()
+{
+    linkconnect = FALSE;
+    send_status_to_desktop(STATUS_DISCONNECTED);
+    fputs("WIRELESS-LAN-DEBUG: Not connect,return.\n", stderr);
+    review_tree_vanpro(_("Not Connect"));
+
+    WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (cell != nullptr)
+        cell->linkstate = 2;
+    // In English whatever the language, so that a failed connect can be told from the idle title.
+    set_title_label("Wireless network selection");
+    // doubleclick stays as it is: after a failure only the button connects again.
+    connect_button_sensitive(TRUE);
+}
+
+gboolean detect_network_link_state(gpointer)
+{
+    static int link_count = 0; // shared by all chains
+
+    get_ap_mac();
+    if (is_associated(Link_AP_MAC)) {
+        acquire_address();
+        link_count = 0;
+        return FALSE;
+    }
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: AP MAC[%s]:Disconnected\n", Link_AP_MAC);
+    if (++link_count < POLL_LIMIT)
+        return TRUE;
+    link_count = 0;
+    give_up_link();
+    return FALSE;
+}
+
+gboolean do_connect(gpointer data)
+{
+    const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
+
+    if (chosen != nullptr && !take_up_network(chosen)) {
+        fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
+        set_title_label(_("Wireless network selection"));
+        give_controls_back();
+        return FALSE;
+    }
+    apply_configuration();
+    g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
+    return FALSE;
+}
