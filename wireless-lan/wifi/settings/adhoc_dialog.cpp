@@ -1,1 +1,185 @@
 #include "settings/adhoc_dialog.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include "base/widgets.h"
+#include "wifi.h"
+
+// Only the ESSID is shown. The other widgets are never placed in the window: they carry the
+// network's encryption and key from one opening to the next.
+struct group_form {
+    GtkWidget *essid;
+    GtkWidget *key;
+    GtkWidget *rbt_off;
+    GtkWidget *rbt_open;
+    GtkWidget *rbt_res;
+    GtkWidget *unplaced[4];
+};
+
+void active_key_entry(GtkToggleButton *togglebutton, gpointer user_data)
+{
+    gtk_widget_set_sensitive(GTK_WIDGET(user_data), !gtk_toggle_button_get_active(togglebutton));
+}
+
+void cb_active_wifi_group(GtkToggleButton *togglebutton, gpointer user_data)
+{
+    gtk_widget_set_sensitive(GTK_WIDGET(user_data), gtk_toggle_button_get_active(togglebutton));
+}
+
+static GtkWidget *new_entry(const char *text)
+{
+    GtkWidget *entry = gtk_entry_new();
+    g_autofree gchar *shown = displayable(text);
+
+    gtk_editable_set_editable(GTK_EDITABLE(entry), TRUE);
+    gtk_entry_set_text(GTK_ENTRY(entry), shown);
+    return entry;
+}
+
+// Copies the entry's text into the field that it was filled from. A text left as it was shown
+// leaves the field alone: its bytes need not be UTF-8.
+static void take_entry(GtkWidget *entry, char *field, gsize size)
+{
+    const gchar *text = gtk_entry_get_text(GTK_ENTRY(entry));
+    g_autofree gchar *shown = displayable(field);
+
+    if (strcmp(text, shown) != 0)
+        copy_field(field, size, text);
+}
+
+static gboolean is_empty(GtkWidget *entry)
+{
+    return gtk_entry_get_text_length(GTK_ENTRY(entry)) == 0;
+}
+
+static GtkWidget *new_radio(GtkWidget *box, GSList *group, const char *label)
+{
+    GtkWidget *radio = gtk_radio_button_new_with_label(group, label);
+
+    gtk_box_pack_start(GTK_BOX(box), radio, FALSE, FALSE, 0);
+    return radio;
+}
+
+static GSList *radio_group(GtkWidget *radio)
+{
+    return gtk_radio_button_get_group(GTK_RADIO_BUTTON(radio));
+}
+
+static gboolean is_active(GtkWidget *button)
+{
+    return gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(button));
+}
+
+static void set_active(GtkWidget *button, gboolean active)
+{
+    gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(button), active);
+}
+
+static GtkWidget *unplaced(GtkWidget *widget)
+{
+    return static_cast<GtkWidget *>(g_object_ref_sink(widget));
+}
+
+static void build_unplaced(group_form *form, const WIFI_CELL *group_info)
+{
+    GtkWidget *box = gtk_hbox_new(FALSE, 0);
+
+    form->key = new_entry(group_info->userkey);
+    gtk_entry_set_visibility(GTK_ENTRY(form->key), FALSE);
+    gtk_widget_set_sensitive(form->key, group_info->encmode != ENC_OFF);
+
+    form->rbt_off = new_radio(box, nullptr, _("off"));
+    form->rbt_open = new_radio(box, radio_group(form->rbt_off), _("open"));
+    form->rbt_res = new_radio(box, radio_group(form->rbt_off), _("restricted"));
+    set_active(form->rbt_off, group_info->encmode == ENC_OFF);
+    set_active(form->rbt_open, group_info->encmode == ENC_OPEN);
+    set_active(form->rbt_res, group_info->encmode == ENC_RESTRICTED);
+    g_signal_connect(form->rbt_off, "toggled", G_CALLBACK(active_key_entry), form->key);
+
+    form->unplaced[0] = unplaced(gtk_label_new(_("Key")));
+    form->unplaced[1] = unplaced(form->key);
+    form->unplaced[2] = unplaced(gtk_label_new(_("WEP")));
+    form->unplaced[3] = unplaced(box);
+}
+
+static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
+{
+    GtkWidget *frame = gtk_frame_new(_("Ad-Hoc Information"));
+    GtkWidget *table = gtk_table_new(8, 2, FALSE);
+    GtkWidget *label = gtk_label_new(_("ESSID"));
+    const GtkAttachOptions fill = GTK_FILL;
+    const GtkAttachOptions expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
+
+    gtk_frame_set_label_align(GTK_FRAME(frame), 0, 0.6F);
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    gtk_container_set_border_width(GTK_CONTAINER(frame), 10);
+    gtk_container_set_border_width(GTK_CONTAINER(table), 5);
+    gtk_container_add(GTK_CONTAINER(frame), table);
+
+    form->essid = new_entry(group_info->essid);
+    gtk_misc_set_alignment(GTK_MISC(label), 1.0, 0.5);
+    gtk_label_set_mnemonic_widget(GTK_LABEL(label), form->essid);
+    gtk_table_attach(GTK_TABLE(table), label, 0, 1, 0, 1, expand, expand, 5, 5);
+    gtk_table_attach(GTK_TABLE(table), form->essid, 1, 2, 0, 1, fill, fill, 5, 5);
+    return frame;
+}
+
+static GtkWidget *new_group_dialog()
+{
+    GtkWidget *dialog = gtk_dialog_new_with_buttons(
+        _("Ad-Hoc Information"), nullptr, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
+        GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
+
+    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
+    // Without a parent only this keeps it above the settings dialog, which is blocked meanwhile.
+    gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
+    // The window takes the default itself, so that Enter neither accepts nor cancels.
+    gtk_widget_set_can_default(dialog, TRUE);
+    gtk_widget_grab_default(dialog);
+    return dialog;
+}
+
+// Stores what the form holds; what is stored before a refusal stays. FALSE: run the dialog again.
+static gboolean store_group(GtkWidget *dialog, const group_form *form, WIFI_CELL *group_info)
+{
+    if (is_empty(form->essid)) {
+        show_warring_dialog(dialog, _("Please enter the ESSID."));
+        return FALSE;
+    }
+    take_entry(form->essid, group_info->essid, sizeof group_info->essid);
+    group_info->encmode = is_active(form->rbt_off)    ? ENC_OFF
+                          : is_active(form->rbt_open) ? ENC_OPEN
+                                                      : ENC_RESTRICTED;
+    printf("group_info->encmode=%d\r\n", static_cast<int>(group_info->encmode));
+    if (group_info->encmode != ENC_OFF) {
+        if (is_empty(form->key)) {
+            show_warring_dialog(dialog, _("Please enter the Key."));
+            return FALSE;
+        }
+        take_entry(form->key, group_info->userkey, sizeof group_info->userkey);
+    }
+    copy_field(group_info->mode, sizeof group_info->mode, "Ad-Hoc");
+    return TRUE;
+}
+
+void cb_adhoc_setup(GtkWidget *, gpointer user_data)
+{
+    WIFI_CELL *group_info = static_cast<WIFI_CELL *>(user_data);
+    GtkWidget *dialog = begin_dialog(new_group_dialog());
+    GtkWidget *content = gtk_dialog_get_content_area(GTK_DIALOG(dialog));
+    group_form form;
+
+    build_unplaced(&form, group_info);
+    gtk_box_pack_start(GTK_BOX(content), build_essid_row(&form, group_info), TRUE, TRUE, 0);
+    gtk_widget_show_all(dialog);
+    while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK &&
+           !store_group(dialog, &form, group_info)) {
+    }
+    end_dialog(dialog);
+    for (GtkWidget *widget : form.unplaced) {
+        gtk_widget_destroy(widget);
+        g_object_unref(widget);
+    }
+}

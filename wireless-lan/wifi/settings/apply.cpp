@@ -1,1 +1,164 @@
 #include "settings/apply.h"
+
+#include <arpa/inet.h>
+#include <cerrno>
+#include <cstdio>
+#include <initializer_list>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/commands.h"
+#include "connection/interface_state.h"
+#include "connection/monitor.h"
+
+// Time for the new settings to reach the interface before its address is looked at.
+static const guint FOLLOW_MS = 4000;
+
+const address_setting address_settings[4] = {
+    {"address", N_("Address"), N_("Enter your IP address here, e.g. 192.168.1.2"), &static_address,
+     &WIFI_INTERFACE::address},
+    {"netmask", N_("Netmask"), N_("Enter your netmask here, e.g. 255.255.255.0"), &static_netmask,
+     &WIFI_INTERFACE::netmask},
+    {"broadcast", N_("Broadcast"),
+     N_("Enter your broadcast address here, usually the same like your IP with 255 as last "
+        "number."),
+     &static_broadcast, &WIFI_INTERFACE::broadcast},
+    {"gateway", N_("Gateway"), N_("Enter the IP Address of your default gateway here."),
+     &static_gateway, &WIFI_INTERFACE::gateway},
+};
+
+gchar *settings_key(const char *prefix, const char *iface_name)
+{
+    return g_strconcat(prefix, iface_name, nullptr);
+}
+
+GtkWidget *find_settings_widget(const char *prefix, const char *iface_name)
+{
+    g_autofree gchar *key = settings_key(prefix, iface_name);
+
+    return find_widget(key);
+}
+
+gboolean address_is_valid(const gchar *ip)
+{
+    in_addr address;
+
+    if (ip == nullptr)
+        return FALSE;
+    errno = EINVAL; // inet_pton has no error of its own for a malformed text
+    if (inet_pton(AF_INET, ip, &address) == 1)
+        return TRUE;
+    perror("inet_pton");
+    return FALSE;
+}
+
+static gboolean take_static_addresses(GtkWidget *dialog, WIFI_INTERFACE *iface)
+{
+    for (const address_setting &setting : address_settings) {
+        GtkWidget *entry = find_settings_widget(setting.prefix, iface->name);
+
+        if (entry == nullptr)
+            continue;
+
+        const gchar *text = gtk_entry_get_text(GTK_ENTRY(entry));
+
+        if (!address_is_valid(text)) {
+            gtk_widget_grab_focus(entry); // the message does not say which value it means
+            show_message_box(dialog, _("Settings invalid"));
+            return FALSE;
+        }
+        copy_field(*setting.text, sizeof *setting.text, text);
+        copy_field(iface->*setting.field, sizeof(iface->*setting.field), text);
+    }
+    return TRUE;
+}
+
+static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gboolean *state)
+{
+    GtkWidget *check = find_settings_widget(prefix, iface->name);
+
+    if (check != nullptr)
+        *state = gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(check));
+}
+
+static void host_network(const WIFI_INTERFACE *iface)
+{
+    const WIFI_CELL *group = &iface->wifi_group;
+
+    if (!interface_usable(iface->name, "hosting the Ad-Hoc network"))
+        return;
+
+    g_autofree gchar *up = g_strdup_printf("ifconfig %s up", iface->name);
+    g_autofree gchar *essid = shell_escape(group->essid);
+    // The device hosts without a key; the group's key is only stored.
+    g_autofree gchar *iwset =
+        g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
+                        iface->name, essid, "Ad-Hoc", "off", encryption_word(group->encmode));
+    g_autofree gchar *echo = echo_command(group->essid, "/tmp/essid_tmp");
+
+    run_command(up);
+    printf("essid_buf = %s \n", echo);
+    leave_text_for_scripts(group->essid, "/tmp/essid_tmp", 0644);
+    printf("cmd=%s\r\n", iwset);
+    run_command(iwset);
+}
+
+static void set_list_sensitive(gboolean sensitive)
+{
+    for (const char *key : {"view-press", "button-connect", "button-refresh"})
+        set_widget_sensitive(key, sensitive);
+}
+
+static void enter_host_mode(const WIFI_INTERFACE *iface)
+{
+    host_network(iface);
+    set_list_sensitive(FALSE);
+    set_title_label(_("Ad-Hoc Host Mode"));
+    send_status_to_desktop(STATUS_ASSOCIATED);
+}
+
+// FALSE: there is no association, so no address to ask for.
+static gboolean enter_selection_mode()
+{
+    set_list_sensitive(TRUE);
+    set_title_label(_("Wireless network selection"));
+    send_status_to_desktop(STATUS_DISCONNECTED);
+    if (my_wifi->cell_count < 1)
+        return FALSE;
+
+    get_ap_mac();
+    if (!is_associated(Link_AP_MAC)) {
+        fputs("WIRELESS-LAN-DEBUG: Current state:Disconnected\n", stderr);
+        return FALSE;
+    }
+    review_tree_vanpro(_("Connected\nAcquire IP address..."));
+    set_title_label(_("Wireless network selection"));
+    g_timeout_add(FOLLOW_MS, detect_network_interface_state, nullptr);
+    return TRUE;
+}
+
+int Save_Basic_Setting(GtkWidget *dialog)
+{
+    WIFI_INTERFACE *iface = first_interface();
+
+    if (iface == nullptr)
+        return 1;
+    if (iface->isstatic && !take_static_addresses(dialog, iface))
+        return 0;
+    take_check_state("auto_dns", iface, &iface->auto_dns);
+    take_check_state("adhoc-host", iface, &iface->wifi_group_enable);
+
+    // What cannot be stored is applied all the same: it holds until the device is switched off.
+    if (!interface_usable(iface->name, "saving the settings") ||
+        !save_basic_setting_to_file(SETTINGS_FILE))
+        show_message_box(dialog, _("The settings could not be saved."));
+
+    if (iface->wifi_group_enable)
+        enter_host_mode(iface);
+    else if (!enter_selection_mode())
+        return 1;
+    require_ip_address();
+    return 1;
+}

@@ -5,7 +5,27 @@
 
 #include <gtk/gtk.h>
 
+#include "wifi.h"
+
 constexpr char SETTINGS_FILE[] = "/etc/wireless.conf";
+
+// One address of static addressing: its row in the dialog and the two places that keep its text.
+struct address_setting {
+    const char *prefix; // of the entry's key, and the entry's widget name
+    const char *label;
+    const char *tooltip;
+    gchar (*text)[32];
+    char (WIFI_INTERFACE::*field)[32];
+};
+
+extern const address_setting address_settings[4]; // in the order of the rows
+
+// The key of a widget of the settings dialog: `prefix` followed by the interface's name. g_free it.
+gchar *settings_key(const char *prefix, const char *iface_name);
+
+// The widget under that key, NULL when there is none: a dialog's widgets carry the name that the
+// interface had when it opened.
+GtkWidget *find_settings_widget(const char *prefix, const char *iface_name);
 
 // Takes over what the settings dialog shows. 0: a value was refused, with a message over `dialog`,
 // and nothing was written; 1: done.
