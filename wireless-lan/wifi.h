@@ -133,6 +133,10 @@ inline gchar static_gateway[32] = {};   // likewise
 // character, always NUL-terminated. `text` may be NULL (an empty field) or lie inside the field.
 void copy_field(char *field, gsize size, const char *text);
 
+// Logs GLib's failed-precondition message with a plain function name and the literal expression;
+// g_return_if_fail of C++ would log the whole signature.
+void log_critical(const char *function, const char *expression);
+
 // --- shell ------------------------------------------------------------------------------------
 
 // A new copy of `text` that the shell reads between double quotes as exactly `text`: a backslash
@@ -149,8 +153,8 @@ gchar *echo_command(const char *text, const char *path);
 void run_command(const char *command);
 
 // TRUE for a name that the kernel could give to an interface (1 to 15 bytes, no blank, no '/', no
-// ':', see dev_valid_name in net/core/dev.c) and that means nothing to a shell. For any other name
-// one line goes to standard error, saying that `step` is skipped.
+// ':', see dev_valid_name in net/core/dev.c) and that means nothing to a shell, nor an option to a
+// command. For any other name one line goes to standard error, saying that `step` is skipped.
 gboolean interface_usable(const char *name, const char *step);
 
 // Runs "/sbin/ifconfig %s up" for a usable name.
@@ -183,7 +187,7 @@ gchar *get_essid_value(gchar *src, const gchar *target, int unit);
 
 // Brings `iface` up, runs "iwlist %s scan" (wireless-tools) on it and replaces wifi_cell and
 // cell_count of my_wifi by the networks printed, 128 at most. When the pipe cannot be opened the
-// former records stay.
+// former records stay. For a name that is not usable nothing is run and no network is left.
 void get_cell(WIFI_INTERFACE *iface);
 
 // --- /etc/wireless.conf -----------------------------------------------------------------------
@@ -192,11 +196,12 @@ void get_cell(WIFI_INTERFACE *iface);
 // stored; the old file stands then and standard error has the cause.
 gboolean save_basic_setting_to_file(const gchar *file);
 
-// Reads them back. A missing file changes nothing, a file without a stanza for the interface only
-// empties the hosted network.
+// Reads them back. A file that cannot be opened changes nothing, one without a stanza for the
+// interface only empties the hosted network. The stream stays open until the next call of this
+// reader or the following one.
 void get_basic_setting_from_file(const gchar *file);
 
-// Reads a stanza that begins with "iface NAME inet METHOD" instead.
+// Reads the addressing from a stanza that begins with "iface NAME inet METHOD" instead.
 void get_basic_setting_from_file_Advanced(const gchar *file);
 
 // The value of the first line of `file` that holds `var` and is no comment: the text behind its
@@ -214,8 +219,8 @@ void get_paramval(gchar *source, gchar *keyword, gchar *ret);
 // stands then and standard error has the cause.
 gboolean save_preferred_network_to_file(const gchar *file);
 
-// Rebuilds user_wifi_cell and user_cell_count from the file, 64 networks at most. A missing file
-// changes nothing.
+// Rebuilds user_wifi_cell and user_cell_count from the file, 64 networks at most. A file that
+// cannot be opened changes nothing.
 void get_preferred_network_setting_from_file(const gchar *file);
 
 #endif

@@ -1,1 +1,245 @@
+#include <cstdio>
+#include <cstring>
+
 #include "wifi.h"
+#include "wifi_info/readers.h"
+#include "wifi_info/text.h"
+
+constexpr int LINE_SIZE = 256;
+constexpr int LINE_LIMIT = 255;
+
+// The address lines, in the order of the file; each value has 32 bytes.
+static const struct {
+    const char *keyword;
+    gchar *value;
+} ADDRESSES[] = {
+    {"address", static_address},
+    {"netmask", static_netmask},
+    {"broadcast", static_broadcast},
+    {"gateway", static_gateway},
+};
+
+static const char *encryption_word(t_encmode encmode)
+{
+    if (encmode == ENC_OFF)
+        return "off";
+    return encmode == ENC_OPEN ? "open" : "restricted";
+}
+
+static GString *basic_setting_text(const WIFI_INTERFACE *iface)
+{
+    GString *text = g_string_new(nullptr);
+    append_line(text, "iface", iface->name);
+    if (iface->isstatic) {
+        append_line(text, "addrtype", "static "); // readers of this file rely on the blank
+        for (const auto &address : ADDRESSES)
+            append_line(text, address.keyword, address.value);
+    } else {
+        append_line(text, "addrtype", iface->isdhcp ? "dhcp" : "static");
+        append_line(text, "dns", iface->auto_dns ? "auto" : "manual");
+    }
+    append_number_line(text, "wifigroup", iface->wifi_group_enable);
+    append_line(text, "ESSID", iface->wifi_group.essid);
+    append_line(text, "MODE", "Ad-Hoc");
+    append_line(text, "KEY", iface->wifi_group.userkey);
+    append_line(text, "Encryption", encryption_word(iface->wifi_group.encmode));
+    return text;
+}
+
+gboolean save_basic_setting_to_file(const gchar *file)
+{
+    const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
+    if (!iface) {
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: no interface, %s is not written\n", file);
+        return FALSE;
+    }
+    g_autoptr(GString) text = basic_setting_text(iface);
+    g_autoptr(GError) error = nullptr;
+    if (!replace_file(file, text->str, text->len, &error)) {
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: File %s cannot be open.\n", file);
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
+        return FALSE;
+    }
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", iface->isstatic ? "isstatic" : "isdhcp");
+    return TRUE;
+}
+
+// Reads the next line and trims it. Behind the last line the former one stays, to be read again.
+static gboolean next_line(FILE *stream, char *line)
+{
+    if (!fgets(line, LINE_LIMIT, stream))
+        return FALSE;
+    g_strstrip(line);
+    return TRUE;
+}
+
+// The piece of `line` behind the `index`th blank, trimmed: two blanks in a row hold an empty one.
+// FALSE, and `value` stays, when there are fewer blanks.
+static gboolean get_piece(const char *line, int index, char *value)
+{
+    for (; index > 0; index--) {
+        line = strchr(line, ' ');
+        if (!line)
+            return FALSE;
+        line++;
+    }
+    g_autofree gchar *piece = g_strndup(line, strcspn(line, " "));
+    copy_field(value, LINE_SIZE, g_strstrip(piece));
+    return TRUE;
+}
+
+// The value of a line that begins with `keyword`. FALSE: the line is another one or has no value.
+static gboolean get_value(const char *line, const char *keyword, char *value)
+{
+    return g_str_has_prefix(line, keyword) && get_piece(line, 1, value);
+}
+
+// Reads up to the line that names the first interface and leaves that in `line`. Without an
+// interface no line does.
+static gboolean find_stanza(FILE *stream, char *line)
+{
+    const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
+    char name[LINE_SIZE] = ""; // a line without a name leaves the former one
+    while (next_line(stream, line)) {
+        if (!g_str_has_prefix(line, "iface"))
+            continue;
+        get_piece(line, 1, name);
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: ifname:%s\n", name);
+        if (iface && g_str_equal(name, iface->name))
+            return TRUE;
+    }
+    return FALSE;
+}
+
+static void set_static(WIFI_INTERFACE *iface, gboolean isstatic)
+{
+    iface->isstatic = isstatic;
+    iface->isdhcp = !isstatic;
+}
+
+// Reads a fixed sequence of four lines; one that is not the expected one is passed over.
+static void read_addresses(FILE *stream, char *line)
+{
+    char value[LINE_SIZE];
+    for (const auto &address : ADDRESSES) {
+        next_line(stream, line);
+        if (get_value(line, address.keyword, value))
+            copy_field(address.value, sizeof static_address, value);
+    }
+}
+
+static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
+{
+    WIFI_CELL *group = &iface->wifi_group;
+    char value[LINE_SIZE];
+    next_line(stream, line);
+    printf("buffer=%s\r\n", line);
+    if (get_value(line, "wifigroup", value))
+        iface->wifi_group_enable = decimal(value);
+    next_line(stream, line);
+    if (get_value(line, "ESSID", value))
+        copy_field(group->essid, sizeof group->essid, value);
+    next_line(stream, line);
+    // Whatever the file says; a mode that is not "Ad-Hoc" is what users of the record rely on.
+    copy_field(group->mode, sizeof group->mode, "Ad-Hos");
+    next_line(stream, line);
+    if (get_value(line, "KEY", value))
+        copy_field(group->userkey, sizeof group->userkey, value);
+    next_line(stream, line);
+    if (!get_value(line, "Encryption", value))
+        return;
+    if (g_str_equal(value, "off"))
+        group->encmode = ENC_OFF;
+    else
+        group->encmode = g_str_equal(value, "open") ? ENC_OPEN : ENC_RESTRICTED;
+}
+
+void read_basic_settings(FILE *stream)
+{
+    WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
+    if (iface) {
+        iface->wifi_group_enable = FALSE;
+        iface->wifi_group = {};
+    }
+    char line[LINE_SIZE] = "";
+    char value[LINE_SIZE];
+    if (!find_stanza(stream, line))
+        return;
+    next_line(stream, line);
+    if (get_value(line, "addrtype", value))
+        set_static(iface, g_str_equal(value, "static"));
+    if (iface->isstatic == 1) {
+        read_addresses(stream, line);
+    } else {
+        next_line(stream, line);
+        if (get_value(line, "dns", value))
+            iface->auto_dns = g_str_equal(value, "auto");
+    }
+    read_group(stream, line, iface);
+}
+
+void read_basic_settings_advanced(FILE *stream)
+{
+    char line[LINE_SIZE] = "";
+    char method[LINE_SIZE];
+    if (!find_stanza(stream, line))
+        return;
+    if (get_piece(line, 3, method))
+        set_static(my_wifi->wifi_interface[0], g_str_equal(method, "static"));
+    read_addresses(stream, line);
+}
+
+// Opens the settings for a reader. The stream stays open behind it, so that the file that the
+// settings came from shows among the open files of the process; it is one, however often they are
+// read.
+static FILE *open_settings(const gchar *file)
+{
+    static FILE *settings = nullptr;
+    g_clear_pointer(&settings, fclose);
+    settings = open_text(file);
+    return settings;
+}
+
+void get_basic_setting_from_file(const gchar *file)
+{
+    FILE *stream = open_settings(file);
+    if (stream)
+        read_basic_settings(stream);
+}
+
+void get_basic_setting_from_file_Advanced(const gchar *file)
+{
+    FILE *stream = open_settings(file);
+    if (stream)
+        read_basic_settings_advanced(stream);
+}
+
+gchar *get_file_var(const gchar *file, const gchar *var)
+{
+    g_autofree gchar *content = nullptr;
+    if (!g_file_get_contents(file, &content, nullptr, nullptr)) {
+        fprintf(stderr, "Could not access file: %s.\n", file);
+        return nullptr;
+    }
+    g_auto(GStrv) lines = g_strsplit(content, "\n", 2048);
+    for (gchar **line = lines; *line; line++) {
+        g_strchomp(*line);
+        if (**line == '#' || !strstr(*line, var))
+            continue;
+        const gchar *separator = strrchr(*line, '=');
+        if (!separator)
+            separator = strrchr(*line, ' ');
+        return separator ? g_strdup(separator + 1) : nullptr;
+    }
+    return g_strdup("");
+}
+
+void get_paramval(gchar *source, gchar *keyword, gchar *ret)
+{
+    if (!source || !keyword || !ret) {
+        log_critical("get_paramval", "source!=NULL&&keyword!=NULL&&ret!=NULL");
+        return;
+    }
+    copy_second_word(ret, 128, source);
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: paramval:%s\n", ret);
+}

@@ -1,1 +1,125 @@
+#include <cstdio>
+#include <cstring>
+
 #include "wifi.h"
+#include "wifi_info/readers.h"
+#include "wifi_info/text.h"
+
+constexpr int LINE_SIZE = 255;
+
+static const char *encryption_word(t_encmode encmode)
+{
+    if (encmode == ENC_RESTRICTED)
+        return "restricted";
+    return encmode == ENC_OPEN ? "open" : "off";
+}
+
+gboolean save_preferred_network_to_file(const gchar *file)
+{
+    g_autoptr(GString) text = g_string_new(nullptr);
+    for (int i = 0; i < my_wifi->user_cell_count; i++) {
+        const WIFI_CELL *cell = my_wifi->user_wifi_cell[i];
+        append_number_line(text, "USERCELL", i);
+        append_line(text, "ALIAS", cell->alias);
+        append_line(text, "ESSID", cell->essid);
+        append_line(text, "MODE", cell->mode);
+        append_number_line(text, "KMGMT", static_cast<int>(cell->key_mgmt));
+        append_number_line(text, "KINDEX", static_cast<int>(cell->key_index));
+        append_line(text, "Encryption", encryption_word(cell->encmode));
+        append_line(text, "KEY", cell->encmode == ENC_OFF ? "off" : cell->userkey);
+    }
+    g_autoptr(GError) error = nullptr;
+    if (!replace_file(file, text->str, text->len, &error)) {
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
+        return FALSE;
+    }
+    return TRUE;
+}
+
+// Copies what stands behind the first blank, inner blanks included.
+static void copy_rest(char *field, gsize size, char *line)
+{
+    gchar *blank = strchr(line, ' ');
+    copy_field(field, size, blank ? g_strstrip(blank) : nullptr);
+}
+
+static t_encmode read_encryption(const char *line)
+{
+    char word[128];
+    copy_second_word(word, sizeof word, line);
+    if (g_str_equal(word, "open"))
+        return ENC_OPEN;
+    return g_str_equal(word, "restricted") ? ENC_RESTRICTED : ENC_OFF;
+}
+
+static guint32 read_number(const char *line)
+{
+    char word[128];
+    copy_second_word(word, sizeof word, line);
+    return static_cast<guint32>(decimal(word));
+}
+
+// Reads the seven lines behind a header by their position alone. What a cut file lacks stays zero.
+static void read_record(FILE *stream, WIFI_CELL *cell)
+{
+    char line[LINE_SIZE] = "";
+    for (int position = 0; position < 7 && fgets(line, sizeof line, stream); position++) {
+        switch (position) {
+        case 0:
+            copy_rest(cell->alias, sizeof cell->alias, line);
+            break;
+        case 1:
+            copy_rest(cell->essid, sizeof cell->essid, line);
+            break;
+        case 2:
+            copy_second_word(cell->mode, sizeof cell->mode, line);
+            break;
+        case 3:
+            cell->key_mgmt = read_number(line);
+            break;
+        case 4:
+            cell->key_index = read_number(line);
+            break;
+        case 5:
+            cell->encmode = read_encryption(line);
+            break;
+        case 6:
+            copy_second_word(cell->userkey, sizeof cell->userkey, line);
+            break;
+        }
+    }
+}
+
+void read_preferred_networks(FILE *stream)
+{
+    char line[LINE_SIZE] = "";
+    gboolean left_out = FALSE;
+    int count = 0;
+    while (fgets(line, sizeof line, stream)) {
+        if (!g_str_has_prefix(line, "USERCELL"))
+            continue;
+        WIFI_CELL record = {};
+        read_record(stream, &record);
+        if (count == MAX_USER_CELLS) {
+            left_out = TRUE;
+            continue;
+        }
+        WIFI_CELL *&cell = my_wifi->user_wifi_cell[count++];
+        if (!cell)
+            cell = g_new(WIFI_CELL, 1);
+        *cell = record;
+    }
+    my_wifi->user_cell_count = count;
+    if (left_out)
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: only the first %d preferred networks are kept\n",
+                MAX_USER_CELLS);
+}
+
+void get_preferred_network_setting_from_file(const gchar *file)
+{
+    FILE *stream = open_text(file);
+    if (!stream)
+        return;
+    read_preferred_networks(stream);
+    fclose(stream);
+}

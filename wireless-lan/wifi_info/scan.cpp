@@ -1,1 +1,129 @@
+#include <cstdio>
+#include <cstring>
+
+#include <libintl.h>
+
 #include "wifi.h"
+#include "wifi_info/readers.h"
+
+constexpr int LINE_SIZE = 512;
+
+// What iwlist says about a network. The order is the one in which the keywords of a line are tried.
+static const struct {
+    const char *keyword;
+    gchar *(*extract)(gchar *src, const gchar *target, int unit);
+    const char *label; // on standard error; the encryption key has a line of its own
+    gsize offset, size;
+} VALUES[] = {
+    {"Address:", get_string_value, "Address", offsetof(WIFI_CELL, address),
+     sizeof(WIFI_CELL::address)},
+    {"ESSID:", get_essid_value, "ESSID", offsetof(WIFI_CELL, essid), sizeof(WIFI_CELL::essid)},
+    {"Mode:", get_string_value, "Mode", offsetof(WIFI_CELL, mode), sizeof(WIFI_CELL::mode)},
+    {"Frequency:", get_string_value, "Frequency", offsetof(WIFI_CELL, channel),
+     sizeof(WIFI_CELL::channel)},
+    {"Quality:", get_string_value, "quality", offsetof(WIFI_CELL, quality),
+     sizeof(WIFI_CELL::quality)},
+    {"Encryption key:", get_string_value, nullptr, offsetof(WIFI_CELL, key),
+     sizeof(WIFI_CELL::key)},
+};
+
+// The name without its quotes; blanks just inside them go too.
+static gchar *unquote(gchar *name)
+{
+    gsize length = strlen(name);
+    if (name[0] == '"')
+        name[0] = ' ';
+    if (name[length - 1] == '"')
+        name[length - 1] = ' ';
+    return g_strstrip(name);
+}
+
+static t_encmode scanned_encmode(const char *word)
+{
+    if (g_str_equal(word, "on"))
+        return ENC_OPEN;
+    return g_str_equal(word, "off") ? ENC_OFF : ENC_RESTRICTED;
+}
+
+// Takes the first value of the line that the network still lacks. FALSE: the line has none.
+static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
+{
+    for (gsize i = 0; i < G_N_ELEMENTS(VALUES); i++) {
+        if (keywords_used[i])
+            continue;
+        g_autofree gchar *value = VALUES[i].extract(line, VALUES[i].keyword, 0);
+        if (!value)
+            continue;
+        keywords_used[i] = TRUE;
+        if (VALUES[i].extract == get_essid_value)
+            unquote(value);
+        copy_field(reinterpret_cast<char *>(cell) + VALUES[i].offset, VALUES[i].size, value);
+        if (VALUES[i].label) {
+            fprintf(stderr, "WIRELESS-LAN-DEBUG: %s:%s\n", VALUES[i].label, value);
+        } else {
+            cell->encmode = scanned_encmode(value);
+            fprintf(stderr, "WIRELESS-LAN-DEBUG: key:%d\n", static_cast<int>(cell->encmode));
+        }
+        return TRUE;
+    }
+    return FALSE;
+}
+
+// Reads from the network's first line to its "Bit Rates:" line. A network without one goes on into
+// the lines of the next, which fill what is still missing.
+static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
+{
+    gboolean keywords_used[G_N_ELEMENTS(VALUES)] = {};
+    do {
+        if (take_value(line, keywords_used, cell))
+            continue;
+        g_autofree gchar *bit_rates = get_string_value(line, "Bit Rates:", 0);
+        if (bit_rates)
+            return;
+    } while (fgets(line, LINE_SIZE, stream));
+}
+
+static void release_cells()
+{
+    for (WIFI_CELL *&cell : my_wifi->wifi_cell)
+        g_clear_pointer(&cell, g_free);
+    my_wifi->cell_count = 0;
+}
+
+void read_cells(FILE *stream)
+{
+    release_cells();
+    char line[LINE_SIZE] = "";
+    while (fgets(line, sizeof line, stream)) {
+        if (!strstr(line, "Cell"))
+            continue;
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: FIND CELL[%d]\n", my_wifi->cell_count);
+        WIFI_CELL *cell = g_new0(WIFI_CELL, 1);
+        copy_field(cell->state, sizeof cell->state, gettext("Disconnect"));
+        cell->linkstate = 2;
+        read_cell(stream, line, cell);
+        if (my_wifi->cell_count == MAX_CELLS) {
+            g_free(cell);
+            return;
+        }
+        my_wifi->wifi_cell[my_wifi->cell_count++] = cell;
+    }
+}
+
+void get_cell(WIFI_INTERFACE *iface)
+{
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: get cell start...\n");
+    if (!interface_usable(iface->name, "the scan")) {
+        release_cells();
+        return;
+    }
+    bring_interface_up(iface->name);
+    g_autofree gchar *command = g_strdup_printf("iwlist %s scan", iface->name);
+    FILE *pipe = popen(command, "r");
+    if (!pipe) {
+        perror("pipe");
+        return;
+    }
+    read_cells(pipe);
+    pclose(pipe);
+}

@@ -119,8 +119,3 @@ const gchar *clist_text(GtkWidget *clist, gint row, gint column)
         return "";
     return text;
 }
-
-void log_critical(const char *function, const char *expression)
-{
-    g_return_if_fail_warning(G_LOG_DOMAIN, function, expression);
-}

@@ -52,7 +52,4 @@ gchar *displayable(const char *text);
 // A row's text of a column list, "" when the cell has none. The list owns it.
 const gchar *clist_text(GtkWidget *clist, gint row, gint column);
 
-// Logs GLib's failed-precondition message with a plain function name and the literal expression.
-void log_critical(const char *function, const char *expression);
-
 #endif

@@ -1,0 +1,26 @@
+// Texts and lines, for the files of this unit.
+
+#ifndef WIFI_INFO_TEXT_H
+#define WIFI_INFO_TEXT_H
+
+#include <cstdio>
+
+#include <glib.h>
+
+// Opens a text file for reading, close-on-exec. NULL for one that cannot be opened, a folder among
+// them; standard error says so.
+FILE *open_text(const gchar *file);
+
+// Copies the second of the words of `text` (separated by white space) into a field as copy_field
+// does; an empty field when there is none.
+void copy_second_word(char *field, gsize size, const char *text);
+
+// The decimal number that `text` begins with, limited to what an int holds; 0 when there is none.
+int decimal(const char *text);
+
+// Appends "KEYWORD VALUE\n". Line ends inside the value become blanks, so that no value can forge
+// another line.
+void append_line(GString *content, const char *keyword, const char *value);
+void append_number_line(GString *content, const char *keyword, int value);
+
+#endif
