@@ -100,7 +100,7 @@ static void host_network(const WIFI_INTERFACE *iface)
 
     run_command(up);
     printf("essid_buf = %s \n", echo);
-    leave_text_for_scripts(group->essid, "/tmp/essid_tmp", 0644);
+    leave_text_for_scripts(group->essid, "/tmp/essid_tmp", 0666);
     printf("cmd=%s\r\n", iwset);
     run_command(iwset);
 }
