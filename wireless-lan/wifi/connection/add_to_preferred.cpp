@@ -1,1 +1,37 @@
 #include "connection/add_to_preferred.h"
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/commands.h"
+#include "connection/question.h"
+#include "preferred/store.h"
+
+void Add2Preferred(GtkWidget *parent)
+{
+    const WIFI_CELL *connecting = scanned_cell(connect_index);
+
+    if (connecting == nullptr)
+        return;
+
+    // By value: a refresh may replace the records while the question is open.
+    const WIFI_CELL cell = *connecting;
+
+    gtk_widget_hide_all(parent);
+
+    g_autofree gchar *alias = ask_text(
+        parent, _("Do you want to add this configuration to the preferred network?"), _("Alias:"));
+
+    if (alias == nullptr || find_widget(FRONT_KEY) == nullptr ||
+        find_widget(BACKEND_KEY) == nullptr)
+        return;
+
+    g_autofree gchar *management = g_strdup_printf("%d", static_cast<int>(cell.key_mgmt));
+    g_autofree gchar *index = g_strdup_printf("%d", static_cast<int>(cell.key_index));
+    const gchar *const ftext[LIST_COLUMNS] = {
+        alias, cell.essid, client_mode(cell.mode), "ENC_OPEN", cell.userkey, management, index};
+
+    if (append_user_cell_row(ftext))
+        save_user_cell_clist();
+    else
+        show_store_full(mainwindow);
+}

@@ -1,1 +1,323 @@
 #include "connection/encrypted_dialog.h"
+
+#include <cstdio>
+#include <cstring>
+#include <initializer_list>
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "preferred/store.h"
+
+static const char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
+static const char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
+static const char ENTRY_KEY[] = "connect_key";
+static const guint PADDING = 5;
+
+gchar *sel_key = nullptr;
+
+// The network that the dialog was built for, by name: connect_index may move while it is open.
+static char sought_essid[sizeof(WIFI_CELL::essid)] = "";
+
+static GtkWidget *backend_list()
+{
+    GtkWidget *backend = find_widget(BACKEND_KEY);
+
+    if (backend == nullptr)
+        fputs("WIRELESS-LAN-DEBUG: user_cell_list_backend get failed.\n", stderr);
+    return backend;
+}
+
+// What the combo builders return without the preferred lists: readers of the state know it.
+static GtkWidget *invalid_widget()
+{
+    return static_cast<GtkWidget *>(GINT_TO_POINTER(1));
+}
+
+// The first preferred network of the sought name from `row` on, -1 when there is none. Row and
+// record are the same network; where rows were edited and not saved only what both have counts.
+static int next_match(GtkWidget *backend, int row)
+{
+    const int records = MIN(MIN(user_wifi_count, my_wifi->user_cell_count), MAX_USER_CELLS);
+    const int rows = MIN(records, GTK_CLIST(backend)->rows);
+
+    for (; row < rows; row++) {
+        const WIFI_CELL *record = my_wifi->user_wifi_cell[row];
+
+        if (record != nullptr && strcmp(record->essid, sought_essid) == 0)
+            return row;
+    }
+    return -1;
+}
+
+static GtkWidget *text_combo(std::initializer_list<const char *> items)
+{
+    GtkWidget *combo = gtk_combo_box_new_text();
+
+    for (const char *item : items)
+        gtk_combo_box_append_text(GTK_COMBO_BOX(combo), item);
+    gtk_combo_box_set_active(GTK_COMBO_BOX(combo), 0);
+    return combo;
+}
+
+// Makes the item active that the decimal `number` names; one that is not there gives the first.
+static void set_active_number(GtkWidget *combo, const char *number)
+{
+    const gint64 item = g_ascii_strtoll(number, nullptr, 10);
+    const int items =
+        gtk_tree_model_iter_n_children(gtk_combo_box_get_model(GTK_COMBO_BOX(combo)), nullptr);
+
+    gtk_combo_box_set_active(GTK_COMBO_BOX(combo),
+                             item >= 0 && item < items ? static_cast<gint>(item) : 0);
+}
+
+GtkWidget *create_Authentication_ComboBox()
+{
+    GtkWidget *backend = backend_list();
+
+    if (backend == nullptr)
+        return invalid_widget();
+
+    GtkWidget *combo = text_combo({"WEP", "WPA-PSK/WPA2-PSK"});
+
+    for (int row = next_match(backend, 0); row >= 0; row = next_match(backend, row + 1)) {
+        const gchar *number = clist_text(backend, row, LIST_KEY_MGMT);
+
+        printf("%s\n", number);
+        set_active_number(combo, number);
+    }
+    g_signal_connect(combo, "changed", G_CALLBACK(cb_key_index_stat), nullptr);
+    return combo;
+}
+
+GtkWidget *create_Key_Index_ComboBox()
+{
+    GtkWidget *backend = backend_list();
+
+    if (backend == nullptr)
+        return invalid_widget();
+
+    GtkWidget *combo = create_normal_ComboBox();
+
+    for (int row = next_match(backend, 0); row >= 0; row = next_match(backend, row + 1))
+        set_active_number(combo, clist_text(backend, row, LIST_KEY_INDEX));
+    return combo;
+}
+
+GtkWidget *create_ComboBox(int *n)
+{
+    GtkWidget *backend = backend_list();
+
+    if (backend == nullptr)
+        return invalid_widget();
+
+    GtkWidget *combo = gtk_combo_box_new_text();
+
+    *n = 0;
+    for (int row = next_match(backend, 0); row >= 0; row = next_match(backend, row + 1)) {
+        const gchar *alias = clist_text(backend, row, LIST_ALIAS);
+        g_autofree gchar *item =
+            displayable(alias[0] != '\0' ? alias : clist_text(backend, row, LIST_ESSID));
+
+        gtk_combo_box_append_text(GTK_COMBO_BOX(combo), item);
+        ++*n;
+    }
+    gtk_widget_set_sensitive(combo, *n > 0);
+    g_signal_connect(combo, "changed", G_CALLBACK(cb_change_network), nullptr);
+    return combo;
+}
+
+static gboolean wep_active(GtkWidget *authentication)
+{
+    return gtk_combo_box_get_active(GTK_COMBO_BOX(authentication)) == 0;
+}
+
+void cb_key_index_stat(GtkWidget *, gpointer)
+{
+    GtkWidget *authentication = find_widget(AUTHENTICATION_KEY);
+
+    if (authentication != nullptr)
+        set_widget_sensitive(KEY_INDEX_KEY, wep_active(authentication));
+}
+
+// Copies the active item of the combo under `key` into a record and a global.
+static void take_active(const char *key, guint32 *field, int *global)
+{
+    GtkWidget *combo = find_widget(key);
+
+    if (combo == nullptr)
+        return;
+    *global = gtk_combo_box_get_active(GTK_COMBO_BOX(combo));
+    *field = static_cast<guint32>(*global);
+}
+
+void cb_change_network(GtkWidget *combobox, gpointer)
+{
+    GtkWidget *backend = backend_list();
+    const int position = gtk_combo_box_get_active(GTK_COMBO_BOX(combobox));
+
+    if (backend == nullptr || position < 0)
+        return;
+
+    int row = next_match(backend, 0);
+
+    for (int i = 0; i < position && row >= 0; i++)
+        row = next_match(backend, row + 1);
+    if (row < 0)
+        return;
+
+    WIFI_CELL *record = my_wifi->user_wifi_cell[row];
+    GtkWidget *entry = find_widget(ENTRY_KEY);
+
+    if (entry != nullptr) {
+        g_autofree gchar *shown = displayable(record->userkey);
+
+        gtk_entry_set_visibility(GTK_ENTRY(entry), FALSE);
+        gtk_entry_set_text(GTK_ENTRY(entry), shown);
+        g_free(sel_key);
+        sel_key = g_strdup(record->userkey);
+    }
+    // The record takes over what is shown, not the other way round: the combos show the last
+    // network of the name, and a changed answer is recognised against these two.
+    take_active(AUTHENTICATION_KEY, &record->key_mgmt, &key_mgmt);
+    take_active(KEY_INDEX_KEY, &record->key_index, &key_index);
+}
+
+gboolean connect_key_cb(GdkEventKey *)
+{
+    GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
+
+    if (entry == nullptr)
+        return FALSE;
+    if (!gtk_entry_get_visibility(entry)) {
+        // The backspace under way deletes this blank, so the cursor has to stand behind it.
+        gtk_entry_set_text(entry, " ");
+        gtk_editable_set_position(GTK_EDITABLE(entry), -1);
+    }
+    gtk_entry_set_visibility(entry, TRUE);
+    return FALSE;
+}
+
+gchar *entered_key()
+{
+    GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
+
+    if (entry == nullptr)
+        return nullptr;
+    if (sel_key != nullptr && !gtk_entry_get_visibility(entry)) {
+        g_autofree gchar *shown = displayable(sel_key);
+
+        if (strcmp(gtk_entry_get_text(entry), shown) == 0)
+            return g_strdup(sel_key);
+    }
+    return g_strdup(gtk_entry_get_text(entry));
+}
+
+static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
+{
+    gtk_table_attach(GTK_TABLE(table), widget, left, 2, row, row + 1,
+                     static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL), GTK_FILL, PADDING,
+                     PADDING);
+}
+
+// A frame over the whole width of `row`. A combo that could not be built leaves it empty.
+static GtkWidget *attach_frame(GtkWidget *table, const gchar *title, guint row, GtkWidget *child)
+{
+    GtkWidget *frame = gtk_frame_new(title);
+
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    if (child != invalid_widget()) {
+        gtk_container_set_border_width(GTK_CONTAINER(child), PADDING);
+        gtk_container_add(GTK_CONTAINER(frame), child);
+    }
+    attach(table, frame, 0, row);
+    return frame;
+}
+
+static void attach_notice(GtkWidget *table)
+{
+    GtkWidget *image =
+        gtk_image_new_from_stock(GTK_STOCK_DIALOG_AUTHENTICATION, GTK_ICON_SIZE_DIALOG);
+    GtkWidget *label = gtk_label_new(_("Encrypted Network,Please enter the key."));
+
+    gtk_table_attach(GTK_TABLE(table), image, 0, 1, 0, 1, GTK_FILL, GTK_FILL, PADDING, PADDING);
+    gtk_label_set_line_wrap(GTK_LABEL(label), TRUE);
+    gtk_misc_set_alignment(GTK_MISC(label), 0, 0.5);
+    attach(table, label, 1, 0);
+}
+
+static GtkWidget *create_key_box(GtkWidget *entry, GtkWidget *index)
+{
+    GtkWidget *box = gtk_hbox_new(FALSE, 0);
+    GtkWidget *index_box = gtk_hbox_new(FALSE, 0);
+    GtkWidget *label = gtk_label_new(_(" Key index: "));
+
+    gtk_widget_set_size_request(entry, 280, 30);
+    gtk_widget_set_size_request(index_box, 120, 30);
+    gtk_box_pack_start(GTK_BOX(box), entry, TRUE, TRUE, 0);
+    gtk_box_pack_start(GTK_BOX(box), index_box, FALSE, FALSE, 0);
+    gtk_box_pack_start(GTK_BOX(index_box), label, FALSE, FALSE, 0);
+    if (index != invalid_widget()) {
+        gtk_widget_set_size_request(index, 40, 30);
+        gtk_label_set_mnemonic_widget(GTK_LABEL(label), index);
+        gtk_box_pack_start(GTK_BOX(index_box), index, TRUE, TRUE, 0);
+    }
+    return box;
+}
+
+static GtkWidget *create_dialog_window()
+{
+    GtkWidget *dialog = gtk_dialog_new_with_buttons(
+        _("Encrypted Network"), nullptr, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
+        GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
+
+    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_window_set_default_size(GTK_WINDOW(dialog), 400, 320);
+    gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
+    gtk_widget_set_can_default(dialog, TRUE);
+    gtk_widget_grab_default(dialog);
+    gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
+    return dialog;
+}
+
+static void cb_key_entered(GtkEntry *, gpointer dialog)
+{
+    gtk_dialog_response(GTK_DIALOG(dialog), GTK_RESPONSE_OK);
+}
+
+GtkWidget *build_encrypted_dialog(int *match_count)
+{
+    const WIFI_CELL *cell = scanned_cell(connect_index);
+
+    copy_field(sought_essid, sizeof sought_essid, cell != nullptr ? cell->essid : "");
+    g_clear_pointer(&sel_key, g_free);
+
+    GtkWidget *dialog = create_dialog_window();
+    GtkWidget *table = gtk_table_new(4, 2, FALSE);
+    GtkWidget *authentication = create_Authentication_ComboBox();
+    GtkWidget *preferred = create_ComboBox(match_count);
+    GtkWidget *entry = gtk_entry_new();
+    GtkWidget *index = create_Key_Index_ComboBox();
+
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: create_ComboBox match_count=%d\n", *match_count);
+    gtk_container_set_border_width(GTK_CONTAINER(table), 5);
+    gtk_container_add(GTK_CONTAINER(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table);
+    attach_notice(table);
+    attach_frame(table, _("Authentication"), 1, authentication);
+    attach_frame(table, _("Preferred Network"), 2, preferred);
+    attach_frame(table, _("Key"), 3, create_key_box(entry, index));
+
+    register_named_widget(entry, ENTRY_KEY);
+    gtk_entry_set_visibility(GTK_ENTRY(entry), *match_count == 0);
+    g_signal_connect(entry, "backspace", G_CALLBACK(connect_key_cb), nullptr);
+    g_signal_connect(entry, "activate", G_CALLBACK(cb_key_entered), dialog);
+    gtk_widget_grab_focus(entry);
+    if (authentication != invalid_widget())
+        register_named_widget(authentication, AUTHENTICATION_KEY);
+    if (index != invalid_widget())
+        register_named_widget(index, KEY_INDEX_KEY);
+    cb_key_index_stat(nullptr, nullptr);
+    // This "changed" fills the first network in, so everything else stands by now.
+    if (preferred != invalid_widget() && *match_count > 0)
+        gtk_combo_box_set_active(GTK_COMBO_BOX(preferred), 0);
+    return dialog;
+}

@@ -5,17 +5,34 @@
 
 #include <gtk/gtk.h>
 
-extern gchar *sel_key; // key of the preferred network that was pre-filled, or NULL; flow takes it
+// Key of the preferred network that was filled in, NULL: none. Written here, flow frees it.
+extern gchar *sel_key;
 
 // Builds the dialog for the network at connect_index; `match_count` gets the number of preferred
-// networks of its name. The caller runs and destroys it.
+// networks of its name and stays as it is when the preferred lists are missing. While it is open
+// its controls are registered as "Authentication_ComboBox", "Key_Index_ComboBox" and "connect_key".
+// The caller runs and destroys it.
 GtkWidget *build_encrypted_dialog(int *match_count);
 
+// The key in the dialog, NULL without a dialog. An untouched stored key comes back byte for byte,
+// also where it is no UTF-8. g_free it.
+gchar *entered_key();
+
+// The three combos of the dialog, filled from the preferred networks of its name. Without the
+// preferred lists the result is the invalid widget 1.
 GtkWidget *create_Authentication_ComboBox();
 GtkWidget *create_Key_Index_ComboBox();
 GtkWidget *create_ComboBox(int *n);
+
+// "changed" of the authentication combo: only WEP keys have an index.
 void cb_key_index_stat(GtkWidget *combobox, gpointer data);
+
+// "changed" of the preferred combo: fills the chosen network's key in, hidden, and takes the shown
+// key management and key index over into its record, key_mgmt and key_index.
 void cb_change_network(GtkWidget *combobox, gpointer data);
+
+// "backspace" of the key entry, before the entry's own handling: a hidden key goes as a whole, and
+// what is typed then can be read. Always FALSE.
 gboolean connect_key_cb(GdkEventKey *key_event);
 
 #endif

@@ -1,10 +1,216 @@
 #include "connection/flow.h"
 
-void cb_connect(GtkWidget *, gpointer)
+#include <cstdio>
+#include <cstring>
+
+#include "base/desktop.h"
+#include "base/network_list.h"
+#include "base/state.h"
+#include "base/widgets.h"
+#include "connection/add_to_preferred.h"
+#include "connection/commands.h"
+#include "connection/encrypted_dialog.h"
+#include "connection/monitor.h"
+#include "connection/question.h"
+
+// Long enough for the new status to be drawn before the commands block the window.
+static const guint COMMAND_DELAY_MS = 100;
+
+static void start_connect(const WIFI_CELL *chosen)
 {
+    WIFI_CELL *copy = g_new(WIFI_CELL, 1);
+
+    *copy = *chosen;
+    send_status_to_desktop(STATUS_DISCONNECTED);
+    g_timeout_add_full(G_PRIORITY_DEFAULT, COMMAND_DELAY_MS, do_connect, copy, g_free);
+    connect_button_sensitive(FALSE);
+    review_tree_vanpro(_("Connect network..."));
+    set_title_label(_("Connect network..."));
+    doubleclick = FALSE;
 }
 
-gboolean cb_view_sel(GtkWidget *, GdkEventButton *, void *)
+// Asks for the name of a network that hides it. FALSE: the network is gone.
+static gboolean ask_name(WIFI_CELL *chosen)
 {
+    // The question stands on a window of its own, which is never shown.
+    GtkWidget *parent = gtk_window_new(GTK_WINDOW_TOPLEVEL);
+    g_autofree gchar *name =
+        ask_text(parent, _("The essid is empty,Please input the Essid: "), _("Essid:"));
+
+    gtk_widget_destroy(parent);
+    if (!take_up_network(chosen))
+        return FALSE;
+    if (name != nullptr) {
+        WIFI_CELL *cell = scanned_cell(connect_index);
+
+        copy_field(cell->essid, sizeof cell->essid, name);
+        copy_field(chosen->essid, sizeof chosen->essid, name);
+        printf("input essid = %s \n", chosen->essid);
+    }
+    return TRUE;
+}
+
+// Reads the active item of the dialog's combo under `key` into `field` and prints it behind `name`.
+static void read_active(const char *key, guint32 *field, const char *name)
+{
+    GtkWidget *combo = find_widget(key);
+
+    if (combo == nullptr)
+        return;
+    *field = static_cast<guint32>(gtk_combo_box_get_active(GTK_COMBO_BOX(combo)));
+    printf("%s=%d\n", name, static_cast<int>(*field));
+}
+
+static void read_answers(WIFI_CELL *chosen)
+{
+    g_autofree gchar *key = entered_key();
+
+    read_active("Authentication_ComboBox", &chosen->key_mgmt, "key_mgmt");
+    read_active("Key_Index_ComboBox", &chosen->key_index, "do connect key_index");
+    if (key != nullptr)
+        copy_field(chosen->userkey, sizeof chosen->userkey, key);
+    chosen->encmode = ENC_OPEN;
+}
+
+// TRUE unless the answers repeat the preferred network that was filled in.
+static gboolean is_new_configuration(const WIFI_CELL *chosen, int match_count)
+{
+    if (match_count == 0)
+        return TRUE;
+    if (sel_key == nullptr)
+        return FALSE;
+    return strcmp(sel_key, chosen->userkey) != 0 ||
+           key_mgmt != static_cast<int>(chosen->key_mgmt) ||
+           key_index != static_cast<int>(chosen->key_index);
+}
+
+// Runs the dialog of an encrypted network and connects on OK. The network is taken up afresh after
+// each dialog: when a refresh has lost it meanwhile the attempt just ends, since the key is for no
+// other network and the list already shows that this one is gone.
+static void connect_encrypted(WIFI_CELL *chosen)
+{
+    int match_count = 0;
+    GtkWidget *dialog = begin_dialog(build_encrypted_dialog(&match_count));
+
+    gtk_widget_show_all(dialog);
+    if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
+        read_answers(chosen);
+        if (take_up_network(chosen) && is_new_configuration(chosen, match_count))
+            Add2Preferred(dialog);
+        if (take_up_network(chosen))
+            start_connect(chosen);
+    }
+    g_clear_pointer(&sel_key, g_free);
+    end_dialog(dialog);
+}
+
+static void connect_selected()
+{
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: Choice to Connect index[%d],count[%d]\n",
+            my_wifi->cell_index, my_wifi->cell_count);
+    get_interface();
+    // Nothing is shown: a list without a device says enough, and the next refresh tells why.
+    if (my_wifi->interface_count < 1)
+        return;
+    if (my_wifi->cell_count < 1) {
+        show_warring_dialog(mainwindow, _("No Network in Local Area"));
+        return;
+    }
+
+    const WIFI_CELL *cell = scanned_cell(my_wifi->cell_index);
+
+    if (cell == nullptr) {
+        show_warring_dialog(mainwindow, _("Select a Network First"));
+        return;
+    }
+    connect_index = my_wifi->cell_index;
+    if (cell->linkstate == 1) {
+        g_timeout_add(COMMAND_DELAY_MS, do_disconnect, nullptr);
+        fputs("WIRELESS-LAN-DEBUG: now is link down.\n", stderr);
+        return;
+    }
+
+    // By value: what happens while a dialog is open may replace the records.
+    WIFI_CELL chosen = *cell;
+
+    if (chosen.essid[0] == '\0' && !ask_name(&chosen))
+        return;
+    if (strcmp(chosen.key, "on") == 0) {
+        connect_encrypted(&chosen);
+        return;
+    }
+    chosen.encmode = ENC_OFF;
+    take_up_network(&chosen);
+    start_connect(&chosen);
+}
+
+void cb_connect(GtkWidget *, gpointer)
+{
+    static gboolean running = FALSE;
+
+    // While a dialog of an earlier press is open only that one is answered.
+    if (running)
+        return;
+    running = TRUE;
+    connect_selected();
+    running = FALSE;
+}
+
+// Makes the network under the pointer the selected one; a selected row is selected anew.
+static void follow_pointer(GtkTreeView *view, const GdkEventButton *event)
+{
+    GtkTreePath *path = nullptr;
+
+    if (!gtk_tree_view_get_path_at_pos(view, static_cast<gint>(event->x),
+                                       static_cast<gint>(event->y), &path, nullptr, nullptr,
+                                       nullptr))
+        return;
+
+    GtkTreeSelection *selection = gtk_tree_view_get_selection(view);
+
+    my_wifi->cell_index = gtk_tree_path_get_indices(path)[0];
+    if (gtk_tree_selection_path_is_selected(selection, path)) {
+        gtk_tree_selection_unselect_all(selection);
+        gtk_tree_selection_select_path(selection, path);
+    }
+    gtk_tree_path_free(path);
+}
+
+gboolean cb_view_sel(GtkWidget *widget, GdkEventButton *event, void *)
+{
+    if (!(my_wifi->cell_count > 0 && my_wifi->interface_count > 0)) {
+        log_critical("cb_view_sel", "my_wifi->cell_count>0&&my_wifi->interface_count>0");
+        return FALSE;
+    }
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: Cell count %d index %d interface count %d\n",
+            my_wifi->cell_count, my_wifi->cell_index, my_wifi->interface_count);
+    follow_pointer(GTK_TREE_VIEW(widget), event);
+    if (my_wifi->cell_index <= -1) {
+        log_critical("cb_view_sel", "my_wifi->cell_index>-1");
+        return FALSE;
+    }
+
+    const WIFI_CELL *cell = scanned_cell(my_wifi->cell_index);
+
+    if (cell == nullptr) {
+        log_critical("cb_view_sel", "my_wifi->wifi_cell[my_wifi->cell_index]!=NULL");
+        return FALSE;
+    }
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: connect_index=%d,my_wifi->cell_index=[%d]\n",
+            connect_index, my_wifi->cell_index);
+
+    const gboolean connected = cell->linkstate == 1;
+
+    if (event->type == GDK_BUTTON_PRESS) {
+        set_connect_label(connected ? GTK_STOCK_DISCONNECT : GTK_STOCK_CONNECT);
+    } else if (event->type == GDK_2BUTTON_PRESS) {
+        printf("double click the button");
+        if (connected) {
+            set_connect_label(GTK_STOCK_DISCONNECT);
+        } else if (doubleclick) {
+            set_connect_label(GTK_STOCK_CONNECT);
+            cb_connect(nullptr, nullptr);
+        }
+    }
     return FALSE;
 }

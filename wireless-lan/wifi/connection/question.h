@@ -1,0 +1,12 @@
+// A question with room for a text.
+
+#ifndef WIFI_CONNECTION_QUESTION_H
+#define WIFI_CONNECTION_QUESTION_H
+
+#include <gtk/gtk.h>
+
+// Asks `message` over `parent` with Yes and No and an entry behind `label`. Returns the entry's
+// text on Yes (g_free it), NULL on any other answer.
+gchar *ask_text(GtkWidget *parent, const gchar *message, const gchar *label);
+
+#endif
