@@ -1,1 +1,66 @@
 #include "preferred/delete_dialog.h"
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "preferred/store.h"
+
+static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
+{
+    GtkWidget *dialog = gtk_dialog_new_with_buttons(_("Delete Network"), GTK_WINDOW(parent),
+                                                    GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
+                                                    GTK_RESPONSE_OK, nullptr);
+    GtkWidget *cancel =
+        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    GtkWidget *table = gtk_table_new(4, 2, FALSE);
+    GtkWidget *image = gtk_image_new_from_stock(GTK_STOCK_DIALOG_WARNING, GTK_ICON_SIZE_DIALOG);
+    GtkWidget *label = gtk_label_new(nullptr);
+    g_autofree gchar *escaped = g_markup_escape_text(name, -1);
+    // The misspelling is the one that the catalogues know.
+    g_autofree gchar *markup =
+        g_strdup_printf("%s\n%s?", _("Do you want to detele the network"), escaped);
+
+    gtk_widget_set_can_default(cancel, TRUE);
+    gtk_widget_grab_default(cancel);
+    gtk_window_set_default_size(GTK_WINDOW(dialog), 120, 120);
+    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_dialog_set_has_separator(GTK_DIALOG(dialog), FALSE);
+    gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
+
+    gtk_label_set_markup(GTK_LABEL(label), markup);
+    gtk_label_set_justify(GTK_LABEL(label), GTK_JUSTIFY_CENTER);
+    gtk_label_set_line_wrap(GTK_LABEL(label), TRUE);
+    gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
+
+    gtk_container_set_border_width(GTK_CONTAINER(table), 5);
+    gtk_table_attach(GTK_TABLE(table), image, 0, 1, 1, 2, GTK_FILL, GTK_FILL, 5, 5);
+    gtk_table_attach_defaults(GTK_TABLE(table), label, 1, 2, 1, 2);
+    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table, TRUE, TRUE,
+                       0);
+    return dialog;
+}
+
+static void delete_network(gint row)
+{
+    remove_user_cell_row(row);
+    if (user_wifi_count < 1) {
+        my_wifi->user_cell_index = -1;
+        return;
+    }
+    select_user_cell_row(MIN(row, user_wifi_count - 1));
+}
+
+void cb_configuration_delete(GtkWidget *, gpointer data)
+{
+    const gint row = my_wifi->user_cell_index;
+
+    if (row < 0 || row >= user_wifi_count || !user_cell_lists_exist())
+        return;
+
+    GtkWidget *dialog =
+        begin_dialog(build_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
+
+    gtk_widget_show_all(dialog);
+    if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist())
+        delete_network(row);
+    end_dialog(dialog);
+}

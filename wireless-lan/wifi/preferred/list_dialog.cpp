@@ -1,5 +1,176 @@
 #include "preferred/list_dialog.h"
 
+#include <cstdio>
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "preferred/add_dialog.h"
+#include "preferred/delete_dialog.h"
+#include "preferred/properties_dialog.h"
+#include "preferred/store.h"
+
+// Scrolls to a row; the list itself does not, as it stands in a viewport at its full height.
+static void reveal_row(GtkWidget *front, gint row)
+{
+    GtkWidget *viewport = gtk_widget_get_parent(front);
+    const gint height = GTK_CLIST(front)->row_height + 1; // with the line between two rows
+
+    if (row >= 0 && GTK_IS_VIEWPORT(viewport))
+        gtk_adjustment_clamp_page(gtk_viewport_get_vadjustment(GTK_VIEWPORT(viewport)),
+                                  row * height, (row + 1) * height + 1);
+}
+
+static void cb_reveal_selected(GtkWidget *front)
+{
+    reveal_row(front, my_wifi->user_cell_index);
+}
+
+static void cb_reveal_focus(GtkWidget *front)
+{
+    reveal_row(front, GTK_CLIST(front)->focus_row);
+}
+
+static void move_selected(gint step)
+{
+    const gint row = my_wifi->user_cell_index;
+
+    if (!user_cell_lists_exist() || row < 0 || row >= user_wifi_count || row + step < 0 ||
+        row + step >= user_wifi_count)
+        return;
+    move_user_cell_row(row + step);
+    cb_reveal_selected(find_widget(FRONT_KEY));
+}
+
+void cb_user_list_up(GtkWidget *, gpointer)
+{
+    move_selected(-1);
+}
+
+void cb_user_list_down(GtkWidget *, gpointer)
+{
+    move_selected(1);
+}
+
+static GtkWidget *create_front_window()
+{
+    GtkWidget *window = gtk_scrolled_window_new(nullptr, nullptr);
+    GtkWidget *front = build_user_cell_clist();
+
+    g_signal_connect_after(front, "select-row", G_CALLBACK(cb_reveal_selected), nullptr);
+    g_signal_connect_after(front, "size-allocate", G_CALLBACK(cb_reveal_selected), nullptr);
+    g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_reveal_focus), nullptr);
+    gtk_container_set_border_width(GTK_CONTAINER(window), 5);
+    gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(window), GTK_POLICY_AUTOMATIC,
+                                   GTK_POLICY_AUTOMATIC);
+    gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(window), front);
+    return window;
+}
+
+static GtkWidget *create_move_buttons()
+{
+    GtkWidget *box = gtk_vbutton_box_new();
+    GtkWidget *up = gtk_button_new_from_stock(GTK_STOCK_GO_UP);
+    GtkWidget *down = gtk_button_new_from_stock(GTK_STOCK_GO_DOWN);
+
+    g_signal_connect(up, "clicked", G_CALLBACK(cb_user_list_up), nullptr);
+    g_signal_connect(down, "clicked", G_CALLBACK(cb_user_list_down), nullptr);
+    gtk_container_add(GTK_CONTAINER(box), up);
+    gtk_container_add(GTK_CONTAINER(box), down);
+    return box;
+}
+
+static GtkWidget *create_list_frame()
+{
+    GtkWidget *frame = gtk_frame_new(nullptr);
+    GtkWidget *table = gtk_table_new(2, 2, FALSE);
+
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    gtk_container_set_border_width(GTK_CONTAINER(frame), 5);
+    gtk_table_attach_defaults(GTK_TABLE(table), create_front_window(), 0, 1, 0, 2);
+    gtk_table_attach(GTK_TABLE(table), create_move_buttons(), 1, 2, 0, 2, GTK_FILL, GTK_FILL, 5, 5);
+    gtk_container_add(GTK_CONTAINER(frame), table);
+    return frame;
+}
+
+static GtkWidget *create_edit_buttons(GtkWidget *dialog)
+{
+    static const struct {
+        const char *stock;
+        const char *key;
+        GCallback handler;
+    } buttons[] = {
+        {GTK_STOCK_ADD, "preferred_button_add", G_CALLBACK(cb_configuration_add)},
+        {GTK_STOCK_DELETE, "preferred_button_delete", G_CALLBACK(cb_configuration_delete)},
+        {GTK_STOCK_PROPERTIES, "preferred_button_properties",
+         G_CALLBACK(cb_configuration_properties)},
+    };
+    GtkWidget *box = gtk_hbox_new(TRUE, 5);
+
+    for (const auto &entry : buttons) {
+        GtkWidget *button = gtk_button_new_from_stock(entry.stock);
+
+        register_named_widget(button, entry.key);
+        g_signal_connect(button, "clicked", entry.handler, dialog);
+        gtk_box_pack_start(GTK_BOX(box), button, TRUE, TRUE, 0);
+    }
+    return box;
+}
+
+static GtkWidget *build_list_dialog()
+{
+    GtkWidget *dialog = gtk_dialog_new_with_buttons(_("Preferred Network Setting"), nullptr,
+                                                    GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
+                                                    GTK_RESPONSE_OK, nullptr);
+    GtkWidget *cancel =
+        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    GtkWidget *frame = gtk_frame_new(_("Preferred Network Setting"));
+    GtkWidget *table = gtk_table_new(4, 2, FALSE);
+    GtkWidget *label = gtk_label_new(
+        _("Automatic connect to one of the network \nfollowing the order in the list below"));
+    const auto expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
+
+    gtk_widget_set_can_default(cancel, TRUE);
+    gtk_widget_grab_default(cancel);
+    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_window_set_default_size(GTK_WINDOW(dialog), 480, 320);
+
+    gtk_frame_set_label_align(GTK_FRAME(frame), 0.0F, 0.6F);
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    gtk_container_set_border_width(GTK_CONTAINER(frame), 5);
+    gtk_container_set_border_width(GTK_CONTAINER(table), 5);
+    gtk_container_add(GTK_CONTAINER(frame), table);
+    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), frame, TRUE, TRUE,
+                       0);
+
+    gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
+    gtk_table_attach(GTK_TABLE(table), label, 0, 2, 0, 1, GTK_FILL, GTK_FILL, 5, 5);
+    gtk_table_attach(GTK_TABLE(table), create_list_frame(), 0, 2, 1, 2, expand, expand, 0, 0);
+    gtk_table_attach(GTK_TABLE(table), create_edit_buttons(dialog), 0, 2, 2, 3, expand, GTK_FILL, 5,
+                     5);
+    return dialog;
+}
+
+// The front list outlives the dialog: the add prompt appends to it.
+static void take_front_list_out()
+{
+    GtkWidget *front = find_widget(FRONT_KEY);
+    GtkWidget *viewport = front != nullptr ? gtk_widget_get_parent(front) : nullptr;
+
+    if (viewport != nullptr)
+        gtk_container_remove(GTK_CONTAINER(viewport), front);
+}
+
 void cb_preferred_network_setting(GtkWidget *, gpointer)
 {
+    GtkWidget *dialog = begin_dialog(build_list_dialog());
+
+    gtk_widget_show_all(dialog);
+    if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
+        fputs("WIRELESS-LAN-DEBUG: OK,we will connect network by this order.\n", stderr);
+        save_user_cell_clist();
+        take_front_list_out();
+    } else {
+        rebuild_user_cell_clist();
+    }
+    end_dialog(dialog);
 }

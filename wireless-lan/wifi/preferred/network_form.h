@@ -5,4 +5,67 @@
 
 #include <gtk/gtk.h>
 
+typedef void (*toggle_handler)(GtkWidget *widget, gpointer data);
+
+// What the two forms differ in: the title, the registry keys of their widgets and who follows the
+// choice between WEP and WPA.
+struct network_form {
+    const char *title;
+    const char *alias;
+    const char *essid;
+    const char *wep;
+    const char *wpa;
+    const char *mode_container;
+    const char *mode_managed;
+    const char *mode_adhoc;
+    const char *wep_container;
+    const char *enc_off;
+    const char *enc_open;
+    const char *enc_restricted;
+    const char *key_hbox;
+    const char *key;
+    const char *key_index;
+    toggle_handler change_wep;
+    toggle_handler change_wpa;
+};
+
+extern const network_form add_form;
+extern const network_form properties_form;
+
+// Builds the dialog of a form over `parent` (may be NULL) with its widgets registered and in their
+// initial state: nothing entered, WEP, "Managed", "off". The caller fills it, connects it, shows,
+// runs and destroys it.
+GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent);
+
+// Lets the form follow its toggles. Only a form that is filled is connected: the handlers find each
+// other's widgets by key.
+void connect_network_form(const network_form &form);
+
+// Fills an entry, or chooses a radio button, by its key.
+void set_form_text(const char *key, const gchar *text);
+void choose_form_radio(const char *key);
+
+// What the user entered or chose; a text belongs to its entry.
+const gchar *form_text(const char *key);
+const char *form_key_mgmt(const network_form &form); // "0": WEP, "1": WPA
+const char *form_mode(const network_form &form);     // "Managed" or "Ad-Hoc"
+const char *form_enc(const network_form &form);      // "ENC_OFF", "ENC_OPEN" or "ENC_RESTRICTED"
+gchar *form_key_index(const network_form &form);     // from "0"; g_free it
+
+// TRUE when the text is there; otherwise the user is told what to enter. The key may be empty while
+// its row is insensitive.
+gboolean form_has_essid(const network_form &form, GtkWidget *dialog);
+gboolean form_has_key(const network_form &form, GtkWidget *dialog);
+
+// "toggled" of WEP and WPA; they act on every toggle. The button that gains the choice is signalled
+// last and decides.
+void change_wep_type(GtkWidget *widget, gpointer data);
+void change_wpa_type(GtkWidget *widget, gpointer data);
+void change_prefer_wep_type(GtkWidget *widget, gpointer data);
+void change_prefer_wpa_type(GtkWidget *widget, gpointer data);
+
+// "toggled" of "off", "open" and "restricted": lets a key be entered for the latter two.
+// `user_data` is the key of the box around the key entry.
+void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data);
+
 #endif

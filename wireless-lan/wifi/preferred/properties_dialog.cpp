@@ -1,1 +1,110 @@
 #include "preferred/properties_dialog.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include "base/state.h"
+#include "base/widgets.h"
+#include "preferred/network_form.h"
+#include "preferred/store.h"
+
+static const network_form &form = properties_form;
+
+static void choose_enc(const gchar *word)
+{
+    if (strcmp(word, "ENC_OFF") == 0)
+        choose_form_radio(form.enc_off);
+    else if (strcmp(word, "ENC_OPEN") == 0)
+        choose_form_radio(form.enc_open);
+    else
+        choose_form_radio(form.enc_restricted);
+}
+
+static void choose_key_index(const gchar *text)
+{
+    GtkComboBox *combo = GTK_COMBO_BOX(find_widget(form.key_index));
+    const gint64 index = g_ascii_strtoll(text, nullptr, 10);
+
+    printf("KEY_INDEX = %s \n", text);
+    if (index >= 0 &&
+        index < gtk_tree_model_iter_n_children(gtk_combo_box_get_model(combo), nullptr))
+        gtk_combo_box_set_active(combo, static_cast<gint>(index));
+}
+
+static void fill_form(gint row)
+{
+    const gchar *enc = user_cell_text(row, LIST_ENC);
+
+    set_form_text(form.alias, user_cell_text(row, LIST_ALIAS));
+    set_form_text(form.essid, user_cell_text(row, LIST_ESSID));
+    if (strcmp(user_cell_text(row, LIST_MODE), "Ad-Hoc") == 0)
+        choose_form_radio(form.mode_adhoc);
+    choose_enc(enc);
+    set_widget_sensitive(form.key_hbox, strcmp(enc, "ENC_OFF") != 0);
+    set_form_text(form.key, user_cell_text(row, LIST_KEY));
+    choose_key_index(user_cell_text(row, LIST_KEY_INDEX));
+}
+
+// Toggling follows; a choice that stands already is not signalled, hence the direct calls.
+static void choose_key_mgmt(gint row)
+{
+    if (strcmp(user_cell_text(row, LIST_KEY_MGMT), "1") == 0) {
+        choose_form_radio(form.wpa);
+        change_prefer_wpa_type(find_widget(form.wpa), nullptr);
+        return;
+    }
+    choose_form_radio(form.wep);
+    change_prefer_wep_type(find_widget(form.wep), nullptr);
+    choose_enc(user_cell_text(row, LIST_ENC));
+}
+
+// Stores an entry in its column. An entry that was left as it was filled leaves the column alone:
+// it may hold bytes that the entry could not show.
+static void store_entry(gint row, list_column column, const char *key)
+{
+    g_autofree gchar *shown = displayable(user_cell_text(row, column));
+    const gchar *text = form_text(key);
+
+    if (strcmp(text, shown) != 0)
+        set_user_cell_text(row, column, text);
+}
+
+// Writes the form into the row, each column as soon as it is read: what stands before a refused
+// entry is in the row already. FALSE: the user was told what is wrong.
+static gboolean store_network(gint row, GtkWidget *dialog)
+{
+    store_entry(row, LIST_ALIAS, form.alias);
+    if (!form_has_essid(form, dialog))
+        return FALSE;
+    store_entry(row, LIST_ESSID, form.essid);
+    set_front_text(row, user_cell_text(row, LIST_ALIAS), user_cell_text(row, LIST_ESSID));
+
+    g_autofree gchar *key_index_text = form_key_index(form);
+
+    set_user_cell_text(row, LIST_KEY_MGMT, form_key_mgmt(form));
+    set_user_cell_text(row, LIST_KEY_INDEX, key_index_text);
+    set_user_cell_text(row, LIST_MODE, form_mode(form));
+    set_user_cell_text(row, LIST_ENC, form_enc(form));
+    if (!form_has_key(form, dialog))
+        return FALSE;
+    store_entry(row, LIST_KEY, form.key);
+    return TRUE;
+}
+
+void cb_configuration_properties(GtkWidget *, gpointer data)
+{
+    const gint row = my_wifi->user_cell_index;
+
+    if (row < 0 || row >= user_wifi_count || !user_cell_lists_exist())
+        return;
+
+    GtkWidget *dialog = begin_dialog(build_network_dialog(form, static_cast<GtkWidget *>(data)));
+
+    fill_form(row);
+    connect_network_form(form);
+    choose_key_mgmt(row);
+    gtk_widget_show_all(dialog);
+    while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && !store_network(row, dialog)) {
+    }
+    end_dialog(dialog);
+}
