@@ -1,0 +1,391 @@
+"""The running program: what its widgets say, and a person's hands on them."""
+
+import json
+import os
+import re
+import signal
+import socket
+
+from .wait import LIMIT, wait_until
+
+
+def _bytes_back(value):
+    """The probe writes bytes as characters; texts become str again, stray bytes as surrogates."""
+    if isinstance(value, str):
+        return value.encode("latin-1").decode("utf-8", "surrogateescape")
+    if isinstance(value, list):
+        return [_bytes_back(one) for one in value]
+    if isinstance(value, dict):
+        return {key: _bytes_back(one) for key, one in value.items()}
+    return value
+
+
+class Widget(dict):
+    """One widget as it was when the tree was read: type, name, text, label, sensitive, usable
+    (sensitive with all its parents), visible, mapped, rect, focus, default, active, items ..."""
+
+    parent = None
+
+    def walk(self):
+        yield self
+        for child in self["children"]:
+            yield from child.walk()
+
+    def all(self, name=None, type=None, **wanted):
+        """All widgets in this one (itself too) with this name, type and further values."""
+        return [one for one in self.walk()
+                if (name is None or one["name"] == name) and (type is None or one["type"] == type)
+                and all(one.get(key) == value for key, value in wanted.items())]
+
+    def find(self, name=None, type=None, **wanted):
+        found = self.all(name, type, **wanted)
+        assert len(found) == 1, f"{len(found)} widgets {name or type} {wanted} in {self.sketch()}"
+        return found[0]
+
+    def texts(self):
+        """Texts of all visible labels, in the order in which they are built."""
+        return [one["text"] for one in self.walk() if "text" in one and one["type"] != "GtkEntry"
+                and one["visible"]]
+
+    def sketch(self, depth=0):
+        line = "  " * depth + f"{self['type']} {self['name']!r}"
+        for key in ("title", "label", "text"):
+            if self.get(key):
+                line += f" {key}={self[key]!r}"
+        line += "" if self["visible"] else " hidden"
+        line += "" if self["sensitive"] else " insensitive"
+        return "\n".join([line] + [child.sketch(depth + 1) for child in self["children"]])
+
+
+def _widget(node, parent=None):
+    widget = Widget(node)
+    widget.parent = parent
+    widget["children"] = [_widget(child, widget) for child in node["children"]]
+    return widget
+
+
+class Pane:
+    """A window of the program: the main one or a dialog. Looks anew at every question."""
+
+    def __init__(self, app, describe, choose):
+        self.app = app
+        self._describe = describe
+        self._choose = choose
+
+    def now(self):
+        """The window's widget tree, None when there is no such window on the screen."""
+        for window in self.app.windows():
+            if window["visible"] and self._choose(window):
+                return window
+        return None
+
+    def tree(self):
+        found = self.now()
+        assert found, f"no {self._describe} on the screen; there is\n{self.app.sketch()}"
+        return found
+
+    def wait(self, limit=LIMIT):
+        wait_until(lambda: (self.now() or {}).get("mapped"),
+                   lambda: f"{self._describe}; on the screen is\n{self.app.sketch()}", limit)
+        return self
+
+    def wait_gone(self, limit=LIMIT):
+        wait_until(lambda: self.now() is None, f"{self._describe} to go", limit)
+
+    def exists(self):
+        return self.now() is not None
+
+    @property
+    def title(self):
+        return self.tree()["title"]
+
+    def find(self, name=None, type=None, **wanted):
+        """The one widget with this widget name (and type, and values); fails without one."""
+        return self.tree().find(name, type, **wanted)
+
+    def all(self, name=None, type=None, **wanted):
+        return self.tree().all(name, type, **wanted)
+
+    def texts(self):
+        return self.tree().texts()
+
+    def text(self, name):
+        widget = self.find(name)
+        return widget["text"] if "text" in widget else widget["label"]
+
+    def label(self, name):
+        return self.find(name)["label"]
+
+    def sensitive(self, name):
+        return self.find(name)["sensitive"]
+
+    def props(self, widget):
+        """All properties of a widget (or of the one with that name): {"properties", "packing",
+        "size-request"}; packing is what its container holds for it (attach edges, expand ...)."""
+        if isinstance(widget, str):
+            widget = self.find(widget)
+        return self.app.ask("props " + widget["id"])
+
+    def rows(self, name):
+        """Rows of a GtkTreeView or GtkCList by widget name: lists of texts."""
+        return [row["texts"] for row in self.app.ask("rows " + self.find(name)["id"])]
+
+    def selected(self, name):
+        """Numbers of its selected rows."""
+        rows = self.app.ask("rows " + self.find(name)["id"])
+        return [number for number, row in enumerate(rows) if row["selected"]]
+
+    # Hands.
+    def _button(self, what):
+        found = [one for one in self.tree().walk() if "GtkButton" in one["type"] or "label" in one
+                 and one["type"].endswith("Button")]
+        named = [one for one in found if one["name"] == what] or \
+                [one for one in found if one.get("label") == what]
+        return named[0] if named else None
+
+    def press(self, what, limit=LIMIT):
+        """Clicks the button with this name or label ("gtk-ok" is a stock button's label) once it
+        can be clicked."""
+        self.click(lambda: self._button(what), what, limit=limit)
+
+    def click(self, what, description=None, button=1, count=1, limit=LIMIT):
+        """Clicks in the middle of a widget: its name, or a function that finds it."""
+        if isinstance(what, str):
+            name = what
+            found = lambda: next(iter(self.all(name)), None)
+        elif isinstance(what, dict):
+            found = lambda: next((one for one in self.tree().walk() if one["id"] == what["id"]), None)
+        else:
+            found = what
+        last = []
+
+        def ready():
+            # In its place, on the screen, and not about to be moved by the window manager.
+            widget = found()
+            usable = widget and widget["mapped"] and widget["usable"] and widget["rect"][2] > 1
+            steady = usable and last == [widget["rect"]] and self.tree().get("active", True)
+            last[:] = [widget["rect"]] if usable else []
+            return widget if steady else None
+
+        widget = wait_until(ready, lambda: f"{description or what} to press in\n{self.app.sketch()}",
+                            limit)
+        x, y, width, height = widget["rect"]
+        self.app.display.click(x + width // 2, y + height // 2, button, count)
+        return widget
+
+    def type(self, name, text, replace=True):
+        """Clicks into an entry and types; `replace` takes away what stands there first."""
+        self.click(name)
+        wait_until(lambda: self.find(name)["focus"], f"the focus on {name}")
+        if replace:
+            self.app.display.key("ctrl+a")
+            self.app.display.key("Delete")
+            wait_until(lambda: self.find(name)["text"] == "", f"{name} to be empty")
+            wait_until(lambda: (text and self.app.display.type(text)) is None
+                       and True, "the keys")
+            wait_until(lambda: self.find(name)["text"] == text,
+                       lambda: f"{name} to hold {text!r}; holds {self.find(name)['text']!r}")
+        else:
+            self.app.display.type(text)
+
+    def choose(self, name, item):
+        """Chooses an item (its text or number) of a combo box, with the keys."""
+        combo = self.find(name)
+        wanted = combo["items"].index(item) if isinstance(item, str) else item
+        self.click(name)
+        menu = wait_until(lambda: next((one for one in self.app.windows() if one["visible"]
+                          and one["mapped"] and one.all(type="GtkMenu")
+                          or one["visible"] and one["mapped"] and one.all(type="GtkTreeMenu")), None),
+                          f"the menu of {name}")
+        entries = [one for one in menu.walk() if "MenuItem" in one["type"] and one["mapped"]]
+        x, y, width, height = entries[wanted]["rect"]
+        self.app.display.click(x + width // 2, y + height // 2)
+        wait_until(lambda: self.find(name)["active"] == wanted, f"{name} to change")
+
+    def cell(self, name, row, column=0):
+        return self.app.ask(f"cell {self.find(name)['id']} {row} {column}")
+
+    def click_row(self, name, row, button=1, count=1, column=0):
+        self._reach(name, row, column)
+        x, y, width, height = self.cell(name, row, column)
+        self.app.display.click(x + min(width, 40) // 2, y + height // 2, button, count)
+
+    def _reach(self, name, row, column):
+        """Turns the wheel until the row is in sight."""
+        def window_of(widget):
+            while widget is not None and widget["type"] != "GtkScrolledWindow":
+                widget = widget.parent
+            return widget
+
+        for _ in range(400):
+            widget = self.find(name)
+            frame = window_of(widget)
+            if frame is None:
+                return
+            left, top, width, height = frame["rect"]
+            x, y, _, cell_height = self.cell(name, row, column)
+            if y >= top and y + cell_height <= top + height:
+                return
+            before = y
+            self.app.display.click(left + width // 2, top + height // 2, 5 if y > top else 4)
+            wait_until(lambda: self.cell(name, row, column)[1] != before, f"{name} to scroll")
+        raise AssertionError(f"row {row} of {name} cannot be reached")
+
+
+class App(Pane):
+    """The program that runs, and its main window: the widgets of the pane are those of it."""
+
+    def __init__(self, device, process, number):
+        self.device, self.display = device, device.display
+        self._process, self._number = process, number
+        self._socket = None
+        super().__init__(self, "main window", self._is_main)
+
+    def _is_main(self, window):
+        return any(one["name"] == "view-press" for one in window.walk())
+
+    # The probe.
+    def ask(self, question):
+        if self._socket is None:
+            self._connect()
+        self._socket.sendall(question.encode() + b"\n")
+        answer = self._stream.readline()
+        assert answer, f"the program ended ({self._process.poll()}):\n{self.stderr()[-3000:]}"
+        return _bytes_back(json.loads(answer))
+
+    def _connect(self):
+        path = self.device.probe_path(self._number)
+
+        def attempt():
+            self._socket = socket.socket(socket.AF_UNIX)
+            self._socket.settimeout(60)
+            try:
+                self._socket.connect(path)
+                return True
+            except OSError:
+                self._socket.close()
+                assert self._process.poll() is None, \
+                    f"the program ended ({self._process.poll()}):\n{self.stderr()[-3000:]}"
+                return False
+
+        wait_until(attempt, lambda: "the program to answer\n" + self.stderr()[-3000:], 60)
+        self._stream = self._socket.makefile("rb")
+
+    def windows(self):
+        """All top-level windows, shown or not."""
+        return [_widget(window) for window in self.ask("tree")]
+
+    def sketch(self):
+        """What is on the screen, to be read."""
+        return "\n".join(one.sketch() for one in self.windows() if one["visible"])
+
+    def registry(self, key):
+        """{"id", "type", "name"} of what the main window holds under the key, or None."""
+        return self.ask("registry " + key)
+
+    def registered_rows(self, key):
+        """Rows of a list that is registered under the key, shown or not."""
+        rows = self.ask("rows @" + key)
+        return rows and [row["texts"] for row in rows]
+
+    # The main window's list.
+    def networks(self):
+        """The shown rows, five texts each."""
+        return self.rows("view-press")
+
+    def wait_title(self, text, limit=LIMIT):
+        wait_until(lambda: self.text("title-label") == text,
+                   lambda: f"the title {text!r}; it is {self.text('title-label')!r}", limit)
+
+    def wait_listed(self, limit=LIMIT):
+        """Until a refresh is over and its rows are there."""
+        wait_until(lambda: (lambda main: main.find("title-label")["text"] ==
+                            "Wireless network selection" and main.find("view-press")["sensitive"])
+                   (self.tree()) and self.networks(), lambda: "networks\n" + self.sketch(), limit)
+        return self.networks()
+
+    def wait_state(self, row, text, limit=LIMIT):
+        """Until a row's last column shows a text."""
+        def state():
+            rows = self.networks()
+            return rows[row][4] if row < len(rows) else None
+        wait_until(lambda: state() == text, lambda: f"state {text!r}; it is {state()!r}", limit)
+
+    # Dialogs.
+    def dialog(self, title=None, text=None, limit=LIMIT):
+        """The dialog with this title, or with a label that has this text, once it is shown."""
+        def choose(window):
+            return not self._is_main(window) and window["type"] != "GtkTooltip" and \
+                (title is None or window["title"] == title) and \
+                (text is None or any(one.get("text") == text for one in window.walk()
+                                     if one["visible"]))
+        return Pane(self, f"dialog {title or text!r}", choose).wait(limit)
+
+    def dialogs(self):
+        """Titles and texts of all shown windows but the main one."""
+        return [(one["title"], one.texts()) for one in self.windows()
+                if one["visible"] and not self._is_main(one)]
+
+    # Keys go where the focus is.
+    def key(self, combination):
+        self.display.key(combination)
+
+    # What it prints, and its end.
+    def stdout(self):
+        return self.device.state_file(f"stdout.{self._number}").decode("utf-8", "surrogateescape")
+
+    def stderr(self):
+        return self.device.state_file(f"stderr.{self._number}").decode("utf-8", "surrogateescape")
+
+    def wait_printed(self, text, count=1, limit=LIMIT):
+        """Until standard output or standard error holds the text `count` times."""
+        wait_until(lambda: self.stdout().count(text) + self.stderr().count(text) >= count,
+                   lambda: f"{text!r} printed {count} times in\n{self.stdout()}\n{self.stderr()}",
+                   limit)
+
+    @property
+    def pid(self):
+        """Process id as this machine sees it."""
+        return wait_until(lambda: _children(self._process.pid), "the program's process")[0]
+
+    @property
+    def inner_pid(self):
+        """Process id as the program itself sees it."""
+        with open(f"/proc/{self.pid}/status", encoding="ascii") as status:
+            return int(re.search(r"^NSpid:.*?(\d+)$", status.read(), re.M)[1])
+
+    def descriptors(self):
+        """What each of its open descriptors is, the probe's own ones left out."""
+        folder = f"/proc/{self.pid}/fd"
+        return {int(number): os.readlink(f"{folder}/{number}") for number in os.listdir(folder)}
+
+    def running(self):
+        return self._process.poll() is None
+
+    def wait_end(self, limit=LIMIT):
+        wait_until(lambda: self._process.poll() is not None, "the program to end", limit)
+        return self._process.returncode
+
+    def quit(self, limit=60):
+        """Closes the main window as its title bar does; gives the exit status."""
+        title = self.tree()["title"]
+        self._disconnect()
+        self.display.close_window(title)
+        return self.wait_end(limit)
+
+    def kill(self):
+        if self.running():
+            os.kill(self.pid, signal.SIGKILL)
+        self._disconnect()
+        return self.wait_end()
+
+    def _disconnect(self):
+        if self._socket is not None:
+            self._stream.close()
+            self._socket.close()
+            self._socket = None
+
+
+def _children(pid):
+    with open(f"/proc/{pid}/task/{pid}/children", encoding="ascii") as children:
+        return [int(child) for child in children.read().split()]
