@@ -4,7 +4,6 @@
 #include <gtk/gtk.h>
 
 #include "base/desktop.h"
-#include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
 #include "window/activation.h"
@@ -84,6 +83,8 @@ int main(int argc, char **argv)
     gtk_container_add(GTK_CONTAINER(mainwindow), pane);
     gtk_paned_add1(GTK_PANED(pane), create_left_text());
     gtk_paned_add2(GTK_PANED(pane), create_list());
+    gtk_widget_show_all(pane);
+    set_default_width(GTK_WINDOW(mainwindow));
 
     g_signal_connect(mainwindow, "expose-event", G_CALLBACK(cb_first_exposure), nullptr);
     g_timeout_add(UNSEEN_MS, start_jobs, nullptr);

@@ -10,6 +10,10 @@
 #include "window/refresh.h"
 #include "window/start_up.h"
 
+static const gint LIST_SIDE_WIDTH = 400; // pixels, the least
+// Borders and shadows around the list, and the scroll bar of a long one.
+static const gint LIST_SIDE_MARGIN = 60;
+
 static GtkWidget *new_scrolled_window()
 {
     GtkWidget *scrolled = gtk_scrolled_window_new(nullptr, nullptr);
@@ -86,7 +90,7 @@ GtkWidget *create_list()
 
     gtk_container_set_border_width(GTK_CONTAINER(box), 10);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), box);
-    gtk_widget_set_size_request(scrolled, 400, 500);
+    gtk_widget_set_size_request(scrolled, LIST_SIDE_WIDTH, 500);
 
     register_named_widget(label, "title-label");
     gtk_misc_set_alignment(GTK_MISC(label), 0, 0);
@@ -108,4 +112,22 @@ GtkWidget *create_list()
     gtk_box_pack_start(GTK_BOX(box), table, FALSE, FALSE, 0);
     gtk_widget_show_all(scrolled);
     return scrolled;
+}
+
+void set_default_width(GtkWindow *window)
+{
+    GtkListStore *store =
+        GTK_LIST_STORE(gtk_tree_view_get_model(GTK_TREE_VIEW(my_wifi->wifi_view)));
+    g_autofree gchar *state =
+        g_strdup_printf("%s:%s", _("Connected\nIP Address"), "255.255.255.255");
+    GtkRequisition list, whole;
+
+    model_data_new(store, "a network's usual name", "Managed", "off", "100/100", state);
+    gtk_widget_size_request(my_wifi->wifi_view, &list);
+    gtk_list_store_clear(store);
+    gtk_widget_size_request(GTK_WIDGET(window), &whole);
+    gtk_window_set_default_size(window,
+                                MIN(whole.width - LIST_SIDE_WIDTH + LIST_SIDE_MARGIN + list.width,
+                                    gdk_screen_get_width(gtk_window_get_screen(window))),
+                                -1);
 }
