@@ -219,18 +219,24 @@ static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
                      PADDING);
 }
 
-// A frame over the whole width of `row`. A combo that could not be built leaves it empty.
-static GtkWidget *attach_frame(GtkWidget *table, const gchar *title, guint row, GtkWidget *child)
+// A frame over the whole width of `row`; the box in it is returned.
+static GtkWidget *attach_frame(GtkWidget *table, const gchar *title, guint row)
 {
     GtkWidget *frame = gtk_frame_new(title);
+    GtkWidget *box = gtk_hbox_new(FALSE, 0);
 
     gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
-    if (child != invalid_widget()) {
-        gtk_container_set_border_width(GTK_CONTAINER(child), PADDING);
-        gtk_container_add(GTK_CONTAINER(frame), child);
-    }
+    gtk_container_set_border_width(GTK_CONTAINER(box), PADDING);
+    gtk_container_add(GTK_CONTAINER(frame), box);
     attach(table, frame, 0, row);
-    return frame;
+    return box;
+}
+
+// Fills the rest of `box` with a combo; one that could not be built is left out.
+static void pack_combo(GtkWidget *box, GtkWidget *combo)
+{
+    if (combo != invalid_widget())
+        gtk_box_pack_start(GTK_BOX(box), combo, TRUE, TRUE, 0);
 }
 
 static void attach_notice(GtkWidget *table)
@@ -245,9 +251,8 @@ static void attach_notice(GtkWidget *table)
     attach(table, label, 1, 0);
 }
 
-static GtkWidget *create_key_box(GtkWidget *entry, GtkWidget *index)
+static void pack_key(GtkWidget *box, GtkWidget *entry, GtkWidget *index)
 {
-    GtkWidget *box = gtk_hbox_new(FALSE, 0);
     GtkWidget *index_box = gtk_hbox_new(FALSE, 0);
     GtkWidget *label = gtk_label_new(_(" Key index: "));
 
@@ -256,12 +261,11 @@ static GtkWidget *create_key_box(GtkWidget *entry, GtkWidget *index)
     gtk_box_pack_start(GTK_BOX(box), entry, TRUE, TRUE, 0);
     gtk_box_pack_start(GTK_BOX(box), index_box, FALSE, FALSE, 0);
     gtk_box_pack_start(GTK_BOX(index_box), label, FALSE, FALSE, 0);
+    pack_combo(index_box, index);
     if (index != invalid_widget()) {
         gtk_widget_set_size_request(index, 40, 30);
         gtk_label_set_mnemonic_widget(GTK_LABEL(label), index);
-        gtk_box_pack_start(GTK_BOX(index_box), index, TRUE, TRUE, 0);
     }
-    return box;
 }
 
 static GtkWidget *create_dialog_window()
@@ -302,9 +306,9 @@ GtkWidget *build_encrypted_dialog(int *match_count)
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table);
     attach_notice(table);
-    attach_frame(table, _("Authentication"), 1, authentication);
-    attach_frame(table, _("Preferred Network"), 2, preferred);
-    attach_frame(table, _("Key"), 3, create_key_box(entry, index));
+    pack_combo(attach_frame(table, _("Authentication"), 1), authentication);
+    pack_combo(attach_frame(table, _("Preferred Network"), 2), preferred);
+    pack_key(attach_frame(table, _("Key"), 3), entry, index);
 
     register_named_widget(entry, ENTRY_KEY);
     gtk_entry_set_visibility(GTK_ENTRY(entry), *match_count == 0);
