@@ -20,9 +20,12 @@ static void reveal_row(GtkWidget *front, gint row)
                                   row * height, (row + 1) * height + 1);
 }
 
-static void cb_reveal_selected(GtkWidget *front)
+static void reveal_selected()
 {
-    reveal_row(front, my_wifi->user_cell_index);
+    GtkWidget *front = find_widget(FRONT_KEY);
+
+    if (front != nullptr)
+        reveal_row(front, my_wifi->user_cell_index);
 }
 
 static void cb_reveal_focus(GtkWidget *front)
@@ -38,7 +41,7 @@ static void move_selected(gint step)
         row + step >= user_wifi_count)
         return;
     move_user_cell_row(row + step);
-    cb_reveal_selected(find_widget(FRONT_KEY));
+    reveal_selected();
 }
 
 void cb_user_list_up(GtkWidget *, gpointer)
@@ -56,13 +59,15 @@ static GtkWidget *create_front_window()
     GtkWidget *window = gtk_scrolled_window_new(nullptr, nullptr);
     GtkWidget *front = build_user_cell_clist();
 
-    g_signal_connect_after(front, "select-row", G_CALLBACK(cb_reveal_selected), nullptr);
-    g_signal_connect_after(front, "size-allocate", G_CALLBACK(cb_reveal_selected), nullptr);
+    g_signal_connect_after(front, "select-row", G_CALLBACK(reveal_selected), nullptr);
     g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_reveal_focus), nullptr);
     gtk_container_set_border_width(GTK_CONTAINER(window), 5);
     gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(window), GTK_POLICY_AUTOMATIC,
                                    GTK_POLICY_AUTOMATIC);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(window), front);
+    // A row that was just added can be scrolled to once the list has grown.
+    g_signal_connect(gtk_scrolled_window_get_vadjustment(GTK_SCROLLED_WINDOW(window)), "changed",
+                     G_CALLBACK(reveal_selected), nullptr);
     return window;
 }
 
@@ -72,6 +77,8 @@ static GtkWidget *create_move_buttons()
     GtkWidget *up = gtk_button_new_from_stock(GTK_STOCK_GO_UP);
     GtkWidget *down = gtk_button_new_from_stock(GTK_STOCK_GO_DOWN);
 
+    gtk_button_box_set_layout(GTK_BUTTON_BOX(box), GTK_BUTTONBOX_START);
+    gtk_box_set_spacing(GTK_BOX(box), 5);
     g_signal_connect(up, "clicked", G_CALLBACK(cb_user_list_up), nullptr);
     g_signal_connect(down, "clicked", G_CALLBACK(cb_user_list_down), nullptr);
     gtk_container_add(GTK_CONTAINER(box), up);

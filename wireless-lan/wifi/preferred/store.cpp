@@ -35,12 +35,20 @@ static gchar *shown_name(const gchar *alias, const gchar *essid)
     return displayable(alias[0] != '\0' ? alias : essid);
 }
 
+// The list asks for another size only where a scrolled window drives it directly; in a viewport new
+// rows would stay out of reach.
+static void front_changed_size()
+{
+    gtk_widget_queue_resize(front_list);
+}
+
 static void append_row(const gchar *const ftext[LIST_COLUMNS])
 {
     g_autofree gchar *front = shown_name(ftext[LIST_ALIAS], ftext[LIST_ESSID]);
 
     gtk_clist_append(GTK_CLIST(front_list), &front);
     gtk_clist_append(GTK_CLIST(backend_list), const_cast<gchar **>(ftext));
+    front_changed_size();
 }
 
 static void append_record(const WIFI_CELL *cell, gboolean say)
@@ -185,6 +193,7 @@ void remove_user_cell_row(gint row)
     gtk_clist_remove(GTK_CLIST(front_list), row);
     gtk_clist_remove(GTK_CLIST(backend_list), row);
     user_wifi_count--;
+    front_changed_size();
 }
 
 void move_user_cell_row(gint row)
@@ -211,6 +220,7 @@ void set_front_text(gint row, const gchar *alias, const gchar *essid)
     g_autofree gchar *text = shown_name(alias, essid);
 
     gtk_clist_set_text(GTK_CLIST(front_list), row, 0, text);
+    front_changed_size();
 }
 
 void select_user_cell_row(gint row)
