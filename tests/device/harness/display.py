@@ -161,7 +161,7 @@ class Display:
         return None
 
     def screenshot(self, path):
-        subprocess.run(["import", "-silent", "-display", self.name, "-window", "root", path],
+        subprocess.run(["import", "-display", self.name, "-window", "root", path],
                        check=False, stdout=self._log, stderr=self._log)
         return path
 
