@@ -128,6 +128,8 @@ class Device:
             "GTK2_RC_FILES": "/dev/null", "GTK_IM_MODULE": "gtk-im-context-simple",
             "GTK_MODULES": f"{self.state}/probe.so", "PROBE_SOCKET": self.probe_path(number),
             "NO_AT_BRIDGE": "1", "PATH": "/usr/sbin:/usr/bin:/sbin:/bin",
+            "UBSAN_OPTIONS": "print_stacktrace=1",
+            "LSAN_OPTIONS": f"suppressions={TOP}/tests/leaks.supp:print_suppressions=0",
         }
         for name in ("ASAN_OPTIONS", "UBSAN_OPTIONS", "LSAN_OPTIONS"):
             if name in os.environ:
