@@ -8,8 +8,7 @@
 
 static const char WHITE_SPACE[] = " \t\n\v\f\r";
 
-// The bytes of the first `length` that are whole characters; `text` is longer than that. Bytes that
-// are no UTF-8 count as characters of their own.
+// How many of the first `length` bytes are whole characters; `text` is longer than that.
 static gsize whole_characters(const char *text, gsize length)
 {
     gsize start = length;
