@@ -130,6 +130,11 @@ class Pane:
         """Rows of a GtkTreeView or GtkCList by widget name: lists of texts."""
         return [row["texts"] for row in self.app.ask("rows " + self.find(name)["id"])]
 
+    def columns(self, name):
+        """Columns of a GtkTreeView: {"title", "width", "renderers": [{"id", "type",
+        "foreground"}]}."""
+        return self.app.ask("columns " + self.find(name)["id"])
+
     def selected(self, name):
         """Numbers of its selected rows."""
         rows = self.app.ask("rows " + self.find(name)["id"])
@@ -355,9 +360,23 @@ class App(Pane):
             return int(re.search(r"^NSpid:.*?(\d+)$", status.read(), re.M)[1])
 
     def descriptors(self):
-        """What each of its open descriptors is, the probe's own ones left out."""
+        """What each of its open descriptors is: {number: target}."""
         folder = f"/proc/{self.pid}/fd"
         return {int(number): os.readlink(f"{folder}/{number}") for number in os.listdir(folder)}
+
+    def sanitized(self):
+        """Whether this is a build with sanitizers."""
+        with open(f"/proc/{self.pid}/maps", encoding="utf-8") as maps:
+            return "libasan" in maps.read() or b"__asan_init" in self._image()
+
+    def _image(self):
+        with open(f"/proc/{self.pid}/exe", "rb") as image:
+            return image.read()
+
+    def private_memory(self):
+        """Private dirty memory, KiB."""
+        with open(f"/proc/{self.pid}/smaps_rollup", encoding="ascii") as sums:
+            return int(re.search(r"^Private_Dirty: *(\d+)", sums.read(), re.M)[1])
 
     def running(self):
         return self._process.poll() is None

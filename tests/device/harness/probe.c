@@ -6,6 +6,7 @@
 //   props ID         all properties of a widget, and those that its container holds for it
 //   registry KEY     the object the main window holds under the key, or null
 //   rows ID|@KEY     rows of a GtkTreeView, a list store or a GtkCList
+//   columns ID       columns of a GtkTreeView with their renderers
 //   cell ID ROW COL  where a cell stands on the screen
 // ID is the pointer that `tree` gives.
 #include <errno.h>
@@ -359,6 +360,38 @@ static void answer_rows(GString *out, const char *id)
         g_string_append(out, "null");
 }
 
+static void answer_columns(GString *out, const char *id)
+{
+    GtkWidget *view = widget_of(id);
+    GList *columns = GTK_IS_TREE_VIEW(view) ? gtk_tree_view_get_columns(GTK_TREE_VIEW(view)) : NULL;
+    g_string_append_c(out, '[');
+    for (GList *at = columns; at != NULL; at = at->next) {
+        GList *renderers = gtk_cell_layout_get_cells(at->data);
+        g_string_append(out, at != columns ? ", {\"title\": " : "{\"title\": ");
+        put_text(out, gtk_tree_view_column_get_title(at->data));
+        put_number(out, "width", gtk_tree_view_column_get_width(at->data));
+        g_string_append(out, ", \"renderers\": [");
+        for (GList *one = renderers; one != NULL; one = one->next) {
+            g_string_append_printf(out, "%s{\"id\": \"%p\"", one != renderers ? ", " : "",
+                                   one->data);
+            put_field(out, "type", G_OBJECT_TYPE_NAME(one->data));
+            if (GTK_IS_CELL_RENDERER_TEXT(one->data)) {
+                GdkColor *color = NULL;
+                g_object_get(one->data, "foreground-gdk", &color, NULL);
+                g_autofree char *text = color != NULL ? gdk_color_to_string(color) : NULL;
+                put_field(out, "foreground", text);
+                if (color != NULL)
+                    gdk_color_free(color);
+            }
+            g_string_append_c(out, '}');
+        }
+        g_string_append(out, "]}");
+        g_list_free(renderers);
+    }
+    g_string_append_c(out, ']');
+    g_list_free(columns);
+}
+
 static void answer_cell(GString *out, const char *id, int row, int column)
 {
     GtkWidget *widget = widget_of(id);
@@ -394,6 +427,8 @@ static void answer(GString *out, char *question)
         answer_registry(out, question + strlen("registry "));
     else if (strcmp(words[0], "rows") == 0)
         answer_rows(out, question + strlen("rows "));
+    else if (strcmp(words[0], "columns") == 0 && count == 2)
+        answer_columns(out, words[1]);
     else if (strcmp(words[0], "cell") == 0 && count == 4)
         answer_cell(out, words[1], atoi(words[2]), atoi(words[3]));
     else

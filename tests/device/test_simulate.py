@@ -1,0 +1,87 @@
+"""The simulated device itself: what the other tests rely on."""
+
+import os
+import subprocess
+
+import pytest
+
+from harness.device import TOP
+
+SIMULATE = f"{TOP}/device/simulate"
+
+
+def run(*command, **more):
+    return subprocess.run(command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False,
+                          stdin=subprocess.DEVNULL, text=True, **more)
+
+
+def test_the_machine_stays_as_it_was():
+    script = ("touch /etc/wireless.conf /tmp/key_tmp /sbin/made-here; mkdir -p /share/locale/xx;"
+              "/sbin/ifconfig wlan0 up; ip -o link show wlan0; echo 1 > /proc/kv/iwifi;"
+              "cat /proc/kv/iwifi /proc/self/comm; exit 7")
+    done = run(SIMULATE, "street", "sh", "-c", script)
+    assert done.returncode == 7
+    assert ",UP" in done.stdout and done.stdout.endswith("1\ncat\n")
+    for path in ("/etc/wireless.conf", "/tmp/key_tmp", "/sbin/made-here", "/share/locale/xx",
+                 "/sys/class/net/wlan0"):
+        assert not os.path.exists(path)
+
+
+def test_an_ordinary_user_can_run_it(tmp_path):
+    if os.getuid() != 0:
+        pytest.fail("run the tests as root, so that this one can change the user")
+    # Somebody who owns nothing here, not even the folder of the tools.
+    done = run("setpriv", "--reuid=65534", "--regid=65534", "--clear-groups", "env",
+               f"HOME={tmp_path}", SIMULATE, "connected", "sh", "-c",
+               "id -u; touch /etc/mine; ip -4 -o address show wlan0; /sbin/iwset a; echo done",
+               cwd="/")
+    assert done.stdout.startswith("0\n") and "192.168.7.23/24" in done.stdout, done.stdout
+    assert done.stdout.endswith("done\n") and not os.path.exists("/etc/mine")
+
+
+def test_scenarios_are_named_when_one_is_missing():
+    done = run(SIMULATE, "nowhere", "true")
+    assert done.returncode == 1 and "street" in done.stdout
+
+
+def test_arguments_arrive_byte_for_byte(device):
+    d = device("street")
+    d.sh(r"""/sbin/iwset '' ' a  b ' "$(printf '\377\n\t\001')" 'Käse' '"\' || true""")
+    command, = d.commands("iwset")
+    assert command.argv == ["/sbin/iwset", "", " a  b ", "\udcff\n\t\x01", "Käse", '"\\']
+    assert command.status == 0
+
+
+REQUESTS = """
+import fcntl, socket, struct
+def ask(request, name):
+    try:
+        answer = fcntl.ioctl(socket.socket(socket.AF_INET, socket.SOCK_DGRAM), request,
+                             struct.pack("16s24x", name))
+        return answer[16:40].hex()
+    except OSError as error:
+        return error.strerror
+for name in (b"wlan0", b"lo", b"nobody0"):
+    for request in (0x8B15, 0x8915, 0x8927):
+        print(ask(request, name))
+"""
+
+
+def test_only_the_access_point_is_answered(device):
+    d = device("connected")
+    d.write("/tmp/ask.py", REQUESTS)
+    mac = d.sh("ip -o link show wlan0 | sed 's/.*ether \\([0-9a-f:]*\\).*/\\1/'").strip()
+    answers = d.sh("/device/run /usr/bin/python3 /tmp/ask.py").splitlines()
+    assert answers[0] == "0100" + "020000000002" + "00" * 16
+    assert answers[1].startswith("02000000" + "c0a80717")
+    assert answers[2].startswith("0100" + mac.replace(":", ""))
+    assert answers[4].startswith("02000000" + "7f000001")
+    assert answers[6:] == ["No such device"] * 3
+
+    # Two requests more find nobody; then it is there for one.
+    d.associate("02:00:00:00:00:AB", after=2, count=1)
+    d.write("/tmp/ask.py", REQUESTS.replace('(b"wlan0", b"lo", b"nobody0")', '[b"wlan0"] * 4')
+            .replace("(0x8B15, 0x8915, 0x8927)", "[0x8B15]"))
+    macs = [answer[4:16] for answer in
+            d.sh("/device/run /usr/bin/python3 /tmp/ask.py").splitlines()]
+    assert macs == ["0" * 12] * 2 + ["0200000000ab"] + ["0" * 12]
