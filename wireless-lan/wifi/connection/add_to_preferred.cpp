@@ -21,8 +21,7 @@ void Add2Preferred(GtkWidget *parent)
     g_autofree gchar *alias = ask_text(
         parent, _("Do you want to add this configuration to the preferred network?"), _("Alias:"));
 
-    if (alias == nullptr || find_widget(FRONT_KEY) == nullptr ||
-        find_widget(BACKEND_KEY) == nullptr)
+    if (alias == nullptr || !user_cell_lists_exist())
         return;
 
     g_autofree gchar *management = g_strdup_printf("%d", static_cast<int>(cell.key_mgmt));

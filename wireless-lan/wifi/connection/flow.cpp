@@ -205,6 +205,7 @@ gboolean cb_view_sel(GtkWidget *widget, GdkEventButton *event, void *)
         set_connect_label(connected ? GTK_STOCK_DISCONNECT : GTK_STOCK_CONNECT);
     } else if (event->type == GDK_2BUTTON_PRESS) {
         printf("double click the button");
+        fflush(stdout); // it has no line end
         if (connected) {
             set_connect_label(GTK_STOCK_DISCONNECT);
         } else if (doubleclick) {
