@@ -186,8 +186,7 @@ class Pane:
             self.app.display.key("ctrl+a")
             self.app.display.key("Delete")
             wait_until(lambda: self.find(name)["text"] == "", f"{name} to be empty")
-            wait_until(lambda: (text and self.app.display.type(text)) is None
-                       and True, "the keys")
+            self.app.display.type(text)
             wait_until(lambda: self.find(name)["text"] == text,
                        lambda: f"{name} to hold {text!r}; holds {self.find(name)['text']!r}")
         else:
