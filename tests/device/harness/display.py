@@ -46,7 +46,7 @@ class Display:
     # What clients ask of the server, in the server's own order: nothing is missed, nothing is read
     # too late, as it would be by looking at a property after the news that it changed.
     def _listen(self):
-        self._changes = []
+        self._changes, self._atoms = [], {}
         self._ear = xdisplay.Display(self.name)
         self._context = self._x.record_create_context(
             0, [record.AllClients],
@@ -87,7 +87,11 @@ class Display:
 
     def root_changes(self):
         """(name, type, format, mode, value) of every change of a root window property, in order."""
-        return [(self._x.get_atom_name(change[0]),) + change[1:] for change in list(self._changes)]
+        changes = list(self._changes)
+        for change in changes:
+            if change[0] not in self._atoms:
+                self._atoms[change[0]] = self._x.get_atom_name(change[0])
+        return [(self._atoms[change[0]],) + change[1:] for change in changes]
 
     def root_property(self, name):
         value = self.root.get_full_property(self._x.intern_atom(name), X.AnyPropertyType)
