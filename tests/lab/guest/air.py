@@ -24,12 +24,13 @@ def run(*command, netns=None, check=True, **more):
     return done.stdout.decode(errors="replace")
 
 
-def start(*command, netns=None, log=None):
+def start(*command, netns=None, log=None, env=None):
     """Start a command in the background; what it prints is kept in the file LOG."""
     if netns:
         command = ("ip", "netns", "exec", netns) + command
     out = open(f"{LOGS}/{log}", "ab") if log else subprocess.DEVNULL
-    return subprocess.Popen(command, stdin=subprocess.DEVNULL, stdout=out, stderr=out)
+    return subprocess.Popen(command, stdin=subprocess.DEVNULL, stdout=out, stderr=out,
+                            env=env)
 
 
 def until(wanted, what, limit=60, pause=0.2):
@@ -40,7 +41,7 @@ def until(wanted, what, limit=60, pause=0.2):
         if value:
             return value
         if time.monotonic() > end:
-            raise TimeoutError(f"{what} (waited {limit} s)")
+            raise TimeoutError(f"{what() if callable(what) else what} (waited {limit} s)")
         time.sleep(pause)
 
 
@@ -108,6 +109,6 @@ def access_point(radio, channel, networks, beacon=50):
 def addresses(*nets):
     """Start the DHCP server for the given subnets. Return the process."""
     options = ["--no-daemon", "--conf-file=/dev/null", "--port=0", "--bind-dynamic",
-               "--log-dhcp", "--leasefile-ro", "--user=root"]
+               "--no-ping", "--leasefile-ro", "--user=root"]
     options += [f"--dhcp-range=10.9.{net}.100,10.9.{net}.150,255.255.255.0,1h" for net in nets]
     return start("dnsmasq", *options, netns=AIR, log="dnsmasq.log")

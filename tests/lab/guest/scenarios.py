@@ -4,6 +4,7 @@ Every scenario is one function; its name, with blanks, is the name of the test. 
 machine and one run of the program; its first function prepares the air. A result is one line of the
 file "results": "ok NAME" or "not ok NAME: reason"."""
 
+import faulthandler
 import os
 import re
 import subprocess
@@ -36,8 +37,8 @@ def connected_to(net, limit=90):
     row = until(lambda: next((i for i, one in enumerate(w.rows()) if one[4].startswith(prefix)), -1)
                 + 1, f"a row with an address of 10.9.{net}.x", limit, 0.5) - 1
     w.idle()
-    same(w.main() and w.button("Disconnect").get_name(), "Disconnect", "the button")
-    shown = w.state_of(row)[len("Connected\nIP Address:"):]
+    same(w.widget("button-connect")["label"], "gtk-disconnect", "the button")
+    shown = w.rows()[row][4][len("Connected\nIP Address:"):]
     have = re.findall(r"inet ([0-9.]+)/", run("ip", "-4", "addr", "show", "dev", "wlan0"))
     same(have, [shown], "the interface's address, as shown,")
     same([i for i, one in enumerate(w.rows()) if one[4].startswith("Connected")], [row],
@@ -49,18 +50,17 @@ def connected_to(net, limit=90):
 def answer_encrypted(key, remember=None, index=0, alias=""):
     """Fill the dialog for the key: INDEX 1 of the first list is WPA. REMEMBER None: not asked."""
     box = w.dialog("Encrypted Network")
-    kind = w.find(w.find(box, w.Role.PANEL, "Authentication"), w.Role.COMBO_BOX)
-    if index is not None:
+    kind = next(one for one in w.walk(box) if one.get("items") == ["WEP", "WPA-PSK/WPA2-PSK"])
+    if kind["active"] != index:
         w.choose(kind, index)
     if key is not None:
-        entry = w.find(box, w.Role.TEXT) or w.find(box, w.Role.PASSWORD_TEXT)
-        w.fill(entry, key)
-    w.press(w.button("OK", box))
+        w.fill(w.find(box, "GtkEntry"), key)
+    w.press_in(box, "gtk-ok")
     if remember is not None:
         prompt = w.dialog("Do you want to add this configuration to the preferred network?")
         if remember:
-            w.fill(w.find(prompt, w.Role.TEXT), alias)
-        w.press(w.button("Yes" if remember else "No", prompt))
+            w.fill(w.find(prompt, "GtkEntry"), alias)
+        w.press_in(prompt, "gtk-yes" if remember else "gtk-no")
 
 
 def wanted_row(name):
@@ -69,11 +69,17 @@ def wanted_row(name):
     return [one[0] for one in rows].index(name)
 
 
+def press_button(label):
+    """Press the button below the list once it says what it is to do."""
+    until(lambda: w.widget("button-connect")["label"] == label, f"the button says {label}", 20)
+    w.press(w.widget("button-connect"))
+
+
 def press_connect(name, nth=0):
     row = wanted_row(name) + nth
     w.select(row)
     w.notices()
-    w.press(w.button("Connect"))
+    press_button("gtk-connect")
     return row
 
 
@@ -153,10 +159,10 @@ def a_refresh_finds_the_connected_network_again():
 def disconnect_leaves_the_network():
     w.select(wanted_row("Market"))
     w.notices()
-    w.press(w.button("Disconnect"))
+    press_button("gtk-disconnect")
     until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
     followed("2")
-    w.button("Connect")
+    until(lambda: w.widget("button-connect")["label"] == "gtk-connect", "the button")
     until(lambda: not linked(), "the interface is not associated", 20)
     same(run("ip", "-4", "-o", "addr", "show", "dev", "wlan0"), "", "the address")
     check(run("pidof", "wpa_supplicant", check=False) == "", "the supplicant still runs")
@@ -176,11 +182,11 @@ def wpa2_with_a_blank_in_its_name():
 
 def a_remembered_network_by_double_click():
     w.select(wanted_row("Home Net"))
-    w.press(w.button("Disconnect"))
+    press_button("gtk-disconnect")
     until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
     w.notices()
     w.select(wanted_row("Home Net"), times=2)
-    answer_encrypted(None, index=None)
+    answer_encrypted(None, index=1)
     connected_to(2)
     followed("2", "3", "4")
 
@@ -201,8 +207,8 @@ def wep_with_the_first_key():
 def a_hidden_network_by_the_name_typed():
     press_connect("")
     box = w.dialog("The essid is empty")
-    w.fill(w.find(box, w.Role.TEXT), "Cellar")
-    w.press(w.button("Yes", box))
+    w.fill(w.find(box, "GtkEntry"), "Cellar")
+    w.press_in(box, "gtk-yes")
     answer_encrypted("hidden treasure", remember=False, index=1)
     connected_to(5)
     followed("2", "3", "4")
@@ -264,7 +270,7 @@ def trouble():
 def a_wrong_key_is_not_connected():
     row = press_connect("Home Net")
     answer_encrypted("wrong horse", remember=False, index=1)
-    until(lambda: w.state_of(row) == "Not Connect", "Not Connect", 120, 1)
+    until(lambda: w.rows()[row][4] == "Not Connect", "Not Connect", 120, 1)
     followed("2", "2")
     w.idle()
     w.photograph("wrong-key")
@@ -279,11 +285,11 @@ def the_right_key_after_it():
 
 def without_addresses_the_address_is_invalid():
     row = press_connect("Silence")
-    until(lambda: w.state_of(row) == "Connected\nAcquire IP address...", "the association", 60, 1)
-    until(lambda: w.state_of(row) == "Connected\nIP address invalid", "giving up", 120, 1)
+    until(lambda: w.rows()[row][4] == "Connected\nAcquire IP address...", "the association", 60, 1)
+    until(lambda: w.rows()[row][4] == "Connected\nIP address invalid", "giving up", 120, 1)
     followed("2", "3")
     w.idle()
-    w.button("Disconnect")
+    same(w.widget("button-connect")["label"], "gtk-disconnect", "the button")
     w.photograph("no-address")
 
 
@@ -305,8 +311,8 @@ def an_access_point_that_is_gone_before_the_press():
     trouble.goer.wait()
     w.select(row)
     w.notices()
-    w.press(w.button("Connect"))
-    until(lambda: w.state_of(row) == "Not Connect", "Not Connect", 120, 1)
+    press_button("gtk-connect")
+    until(lambda: w.rows()[row][4] == "Not Connect", "Not Connect", 120, 1)
     followed("2", "2")
     w.idle()
 
@@ -323,18 +329,22 @@ def settings():
 
 
 def open_settings():
-    w.press(w.button("WLAN Setting"))
+    w.press(w.widget("button-wifi-settings"))
     return w.dialog("WLAN Setting")
 
 
+def tick(box, kind, label, active=True):
+    """Press a radio or check button unless it is as wanted."""
+    button = w.find(box, kind, label=label)
+    if button["active"] != active:
+        w.press(button)
+        until(lambda: w.again(button)["active"] == active, f"{label} is {active}", 20)
+
+
 def write_addresses(box, *values):
-    if not w.checked(w.find(box, w.Role.RADIO_BUTTON, "static")):
-        w.press(w.find(box, w.Role.RADIO_BUTTON, "static"))
-    entries = []
-    until(lambda: w.enabled(w.find(box, w.Role.TEXT)), "the entries are sensitive")
-    for nth, value in enumerate(values):
-        entries.append(w.find(box, w.Role.TEXT, None, nth))
-        w.fill(entries[-1], value)
+    tick(box, "GtkRadioButton", "static")
+    for name, value in zip(("address", "netmask", "broadcast", "gateway"), values):
+        w.fill(w.find(box, "GtkEntry", name), value)
 
 
 def static_addresses_reach_beyond_the_gateway():
@@ -344,7 +354,7 @@ def static_addresses_reach_beyond_the_gateway():
     write_addresses(box, "10.9.1.77", "255.255.255.0", "10.9.1.255", "10.9.1.1")
     w.photograph("settings")
     w.notices()
-    w.press(w.button("OK", box))
+    w.press_in(box, "gtk-ok")
     w.gone(box)
     until(lambda: "inet 10.9.1.77/24 brd 10.9.1.255" in
           run("ip", "-4", "addr", "show", "dev", "wlan0"), "the address is set", 60)
@@ -358,7 +368,7 @@ def static_addresses_serve_a_network_without_any():
     # The same addresses for the next network: nobody there gives any.
     box = open_settings()
     write_addresses(box, "10.9.9.77", "255.255.255.0", "10.9.9.255", "10.9.9.1")
-    w.press(w.button("OK", box))
+    w.press_in(box, "gtk-ok")
     w.gone(box)
     w.idle()
     press_connect("Silence")
@@ -373,11 +383,11 @@ def static_addresses_serve_a_network_without_any():
 
 def dhcp_again():
     box = open_settings()
-    w.press(w.find(box, w.Role.RADIO_BUTTON, "dhcp"))
-    w.press(w.button("OK", box))
+    tick(box, "GtkRadioButton", "dhcp")
+    w.press_in(box, "gtk-ok")
     w.gone(box)
     time.sleep(1)
-    until(lambda: w.enabled(w.button("Connect")), "the window is idle", 90)
+    until(lambda: w.widget("button-connect")["usable"], "the window is idle", 90)
     press_connect("Market")
     connected_to(1)
 
@@ -386,11 +396,11 @@ def an_invalid_address_is_refused():
     before = open("/etc/wireless.conf").read()
     box = open_settings()
     write_addresses(box, "10.9.1.300", "255.255.255.0", "10.9.1.255", "10.9.1.1")
-    w.press(w.button("OK", box))
+    w.press_in(box, "gtk-ok")
     message = w.dialog("Settings invalid")
-    w.press(w.button("OK", message))
+    w.press_in(message, "gtk-ok")
     w.gone(message)
-    w.press(w.button("Cancel", box))
+    w.press_in(box, "gtk-cancel")
     w.gone(box)
     same(open("/etc/wireless.conf").read(), before, "/etc/wireless.conf")
 
@@ -398,21 +408,18 @@ def an_invalid_address_is_refused():
 def a_hosted_network_is_seen_and_joined_by_a_second_station():
     box = open_settings()
     write_addresses(box, "10.9.77.1", "255.255.255.0", "10.9.77.255", "10.9.77.1")
-    host = w.find(box, w.Role.CHECK_BOX, "Ad-Hoc Host")
-    w.press(host)
-    preferences = w.button("Preferences", box)
-    until(lambda: w.enabled(preferences), "Preferences is sensitive")
-    w.press(preferences)
+    tick(box, "GtkCheckButton", "Ad-Hoc Host")
+    w.press_in(box, "gtk-preferences")
     details = w.dialog("Ad-Hoc Information")
-    w.fill(w.find(details, w.Role.TEXT), "Our own")
-    w.press(w.button("OK", details))
+    w.fill(w.find(details, "GtkEntry"), "Our own")
+    w.press_in(details, "gtk-ok")
     w.gone(details)
     w.notices()
-    w.press(w.button("OK", box))
+    w.press_in(box, "gtk-ok")
     w.gone(box)
     until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")
     followed("3")
-    check(not w.enabled(w.button("Connect")), "Connect is sensitive")
+    check(not w.widget("button-connect")["usable"], "Connect is sensitive")
     w.photograph("hosting")
     run("ip", "link", "set", "wlan2", "up", netns=FAR)
 
@@ -435,11 +442,11 @@ def a_hosted_network_is_seen_and_joined_by_a_second_station():
 def from_hosting_back_to_a_network():
     run("iw", "dev", "wlan2", "ibss", "leave", netns=FAR)
     box = open_settings()
-    w.press(w.find(box, w.Role.CHECK_BOX, "Ad-Hoc Host"))
-    w.press(w.find(box, w.Role.RADIO_BUTTON, "dhcp"))
-    w.press(w.button("OK", box))
+    tick(box, "GtkCheckButton", "Ad-Hoc Host", False)
+    tick(box, "GtkRadioButton", "dhcp")
+    w.press_in(box, "gtk-ok")
     w.gone(box)
-    until(lambda: w.enabled(w.button("Refresh")), "the window is idle", 90)
+    until(lambda: w.widget("button-refresh")["usable"], "the window is idle", 90)
     w.refresh()
     press_connect("Market")
     connected_to(1)
@@ -466,7 +473,7 @@ def of_163_networks_128_are_listed():
                   "163 networks are on the air", 60)
     check(found, "no networks")
     w.refresh()
-    listed = w.names()
+    listed = [one[0] for one in w.rows()]
     same(len(listed), 128, "the number of rows")
     same(len(set(listed)), 128, "the number of different rows")
     check(all(re.fullmatch(r"Network \d{3}", one) for one in listed), f"the rows are {listed}")
@@ -488,7 +495,7 @@ def late():
 def without_a_radio_it_says_so():
     box = w.dialog("No Wireless Device")
     w.photograph("no-device")
-    w.press(w.button("Close", box))
+    w.press_in(box, "gtk-close")
     w.gone(box)
     same(w.title(), "No Wireless Device", "the title")
     same(w.rows(), [], "the list")
@@ -497,15 +504,15 @@ def without_a_radio_it_says_so():
 def an_absent_radio_is_waited_for_and_missed():
     # The marker of a built-in radio: the program switches it on and looks again 6 s later.
     open("/etc/build_in_wifi", "w").close()
-    w.press(w.button("Active WIFI"))
+    w.press(w.widget("button-active-device"))
     w.dialog("Checking,please wait...")
     box = w.dialog("Can not found any WIFI device.")
-    w.press(w.button("OK", box))
+    w.press_in(box, "gtk-ok")
     w.gone(box)
 
 
 def a_radio_that_appears_late_is_found():
-    w.press(w.button("Active WIFI"))
+    w.press(w.widget("button-active-device"))
     w.dialog("Checking,please wait...")
     air.radios(3)
     air.access_point(1, 1, [network(b"Market", net=1)])
@@ -515,7 +522,7 @@ def a_radio_that_appears_late_is_found():
     time.sleep(0.5)
     for box in w.windows():
         if "No Network" in w.texts(box):
-            w.press(w.button("Close", box))
+            w.press_in(box, "gtk-close")
     w.idle()
     press_connect("Market")
     connected_to(1)
@@ -579,7 +586,7 @@ def recover():
             time.sleep(1)
     if not w.alive():
         w.begin()
-    until(lambda: w.enabled(w.button("Connect")) or w.title() == "Ad-Hoc Host Mode",
+    until(lambda: w.widget("button-connect")["usable"] or w.title() == "Ad-Hoc Host Mode",
           "the window is idle", 100, 1)
 
 
@@ -589,6 +596,8 @@ def main():
     prepare, scenarios = next((p, s) for p, s in GROUPS.items() if p.__name__ == wanted)
     names = [scenario.__name__ for scenario in scenarios]
     results = open(f"{air.LOGS}/results", "a", buffering=1)
+    # Where it hangs, if it hangs, is in console.log.
+    faulthandler.dump_traceback_later(200, repeat=True)
     begun = time.monotonic()
     try:
         prepare()

@@ -1,48 +1,51 @@
-"""The program's window as a person has it: eyes through AT-SPI, hands through the pointer."""
+"""The program's window as a person has it: eyes that look at its widgets from outside (the probe of
+tests/device, a GTK+ module that answers questions on a socket and changes nothing), and hands on
+the pointer and the keys."""
 
+import json
 import os
 import re
 import shutil
-import signal
+import socket
 import subprocess
 import time
 
-import gi
+from air import LOGS, run, start, until
 
-gi.require_version("Atspi", "2.0")
-from gi.repository import Atspi, GLib  # noqa: E402
-
-from air import LOGS, run, start, until  # noqa: E402
-
-Role = Atspi.Role
-ACTIVE = "button-active-device"
-
-# A scan blocks the program for seconds; what asks it meanwhile has to wait for the answer.
-Atspi.set_timeout(90000, 90000)
+SOCKET = "/tmp/probe"
+IDLE = "Wireless network selection"
 
 _program = None
-_notices = None
+_answers = None
+_seen = 0
 
 
 def begin():
     """Start the program and the watch on the desktop's notices. Return when its window shows."""
-    global _program, _notices
-    path = f"{LOGS}/notices.log"
-    _notices = [path, os.path.getsize(path) if os.path.exists(path) else 0]
+    global _program, _answers, _seen
     if not hasattr(begin, "watch"):
-        begin.watch = start("xprop", "-root", "-spy", "_NET_WIFI_CHANGE_STATUS",
-                            "_NET_WIFI_STOP_CHECK", log="notices.log")
-        # Both properties are named once, set or not, before changes are followed.
-        until(lambda: open(path).read().count("\n") >= 2, "xprop watches the root window")
-        _notices[1] = os.path.getsize(path)
-    _program = start("/lab/wireless-lan", log="program.log")
-    until(main, "the main window", 120)
-    return _program
+        begin.watch = start("xprop", "-root", "-spy", "_NET_WIFI_CHANGE_STATUS", log="notices.log")
+        # The property is told once, set or not, before its changes are followed.
+        until(lambda: os.path.getsize(f"{LOGS}/notices.log"), "xprop watches the root window")
+    _seen = os.path.getsize(f"{LOGS}/notices.log")
+    if os.path.exists(SOCKET):
+        os.unlink(SOCKET)
+    environment = dict(os.environ, GTK_MODULES="/lab/probe.so", PROBE_SOCKET=SOCKET,
+                       ASAN_OPTIONS="detect_leaks=0", UBSAN_OPTIONS="print_stacktrace=1")
+    _program = start("/lab/wireless-lan", log="program.log", env=environment)
+    until(lambda: os.path.exists(SOCKET) or not alive(), "the program answers", 60)
+    connection = socket.socket(socket.AF_UNIX)
+    connection.settimeout(120)
+    until(lambda: connection.connect_ex(SOCKET) == 0, "the program answers", 60)
+    _answers = connection, connection.makefile("rb")
+    until(main, "the main window", 60)
 
 
 def end():
-    """End the program by the close button's request and say whether it ended with status 0."""
-    run("xdotool", "search", "--limit", "1", "--name", "^Wireless LAN$", "windowclose")
+    """Close the main window as its title bar does; return the exit status."""
+    number = run("xdotool", "search", "--limit", "1", "--name", "^Wireless LAN$").split()[-1]
+    run("xdotool", "windowactivate", "--sync", number)
+    run("xdotool", "key", "alt+F4")
     try:
         return _program.wait(20)
     except subprocess.TimeoutExpired:
@@ -54,192 +57,183 @@ def alive():
     return _program.poll() is None
 
 
-def quiet(call, *args):
-    """The value of an AT-SPI call, or None for an object that has gone meanwhile."""
-    try:
-        return call(*args)
-    except GLib.Error:
-        return None
+def ask(question):
+    """One question to the probe, see tests/device/harness/probe.c."""
+    connection, stream = _answers
+    connection.sendall(question.encode() + b"\n")
+    answer = stream.readline()
+    if not answer:
+        raise RuntimeError(f"the program ended with {_program.wait(20)}")
+    return json.loads(answer)
 
 
-def children(thing):
-    count = quiet(thing.get_child_count) or 0
-    return [child for child in (quiet(thing.get_child_at_index, i) for i in range(count)) if child]
-
-
-def application():
-    for one in children(Atspi.get_desktop(0)):
-        if quiet(one.get_process_id) == _program.pid:
-            # Nothing is remembered on this side: what is asked is what is there.
-            one.set_cache_mask(Atspi.Cache.NONE)
-            return one
-    return None
-
-
-def showing(thing):
-    states = quiet(thing.get_state_set)
-    return bool(states) and states.contains(Atspi.StateType.SHOWING)
-
-
-def enabled(thing):
-    states = quiet(thing.get_state_set)
-    return bool(states) and states.contains(Atspi.StateType.SENSITIVE)
-
-
-def checked(thing):
-    return thing.get_state_set().contains(Atspi.StateType.CHECKED)
-
-
-def windows():
-    one = application()
-    return [window for window in (children(one) if one else []) if showing(window)]
-
-
-def main():
-    for window in windows():
-        if window.get_name() == "Wireless LAN":
-            return window
-    return None
+def text_of(raw):
+    """The probe gives a text's bytes as U+0000 to U+00FF."""
+    return raw.encode("latin-1").decode(errors="replace") if raw is not None else None
 
 
 def walk(thing):
-    """Every showing object below THING, cells of tables left out."""
-    for child in children(thing):
-        if not showing(child):
-            continue
-        yield child
-        if child.get_role() != Role.TABLE:
+    """Every shown widget below THING and THING itself."""
+    yield thing
+    for child in thing["children"]:
+        if child["visible"]:
             yield from walk(child)
 
 
-def find(where, role, name=None, nth=0):
-    for thing in walk(where):
-        if thing.get_role() == role and (name is None or thing.get_name() == name):
+def windows():
+    return [one for one in ask("tree") if one["visible"] and one["mapped"]
+            and one["type"] != "GtkTooltip"]
+
+
+def main():
+    return next((one for one in windows() if text_of(one.get("title")) == "Wireless LAN"), None)
+
+
+def texts(where):
+    """What all shown labels below WHERE say."""
+    return [text_of(one["text"]) for one in walk(where) if one["type"] == "GtkLabel"
+            or one["type"] == "GtkAccelLabel"]
+
+
+def find(where, kind=None, name=None, label=None, nth=0):
+    """The NTH widget below WHERE of a type, name or label (a stock button's is its stock id)."""
+    for one in walk(where):
+        if (kind is None or one["type"] == kind) and (name is None or one["name"] == name) \
+                and (label is None or text_of(one.get("label")) == label):
             if not nth:
-                return thing
+                return one
             nth -= 1
     return None
 
 
-def texts(where):
-    """The texts of all labels below WHERE."""
-    return [one.get_name() for one in walk(where) if one.get_role() == Role.LABEL]
+def widget(name):
+    """A widget of the main window by its name."""
+    return find(main(), name=name)
 
 
 def dialog(text, limit=60):
-    """Wait for a window whose title or one of whose labels is, or begins with, TEXT."""
+    """Wait for a window whose title is TEXT or that has a label which begins with it."""
     def there():
-        for window in windows():
-            if window.get_name() == text or any(t.startswith(text) for t in texts(window)):
-                if window.get_name() != "Wireless LAN":
-                    return window
+        for one in windows():
+            if one.get("title") != "Wireless LAN" and (
+                    text_of(one.get("title")) == text
+                    or any(line.startswith(text) for line in texts(one))):
+                return one
         return None
     return until(there, f"a window that says {text!r}", limit)
 
 
+def again(thing):
+    """The same widget as it is now, or None once it is gone."""
+    for window in windows():
+        for one in walk(window):
+            if one["id"] == thing["id"]:
+                return one
+    return None
+
+
 def gone(window):
-    until(lambda: not showing(window), "the window closes")
+    until(lambda: not again(window), "the window closes")
 
 
-def middle(thing):
-    box = thing.get_extents(Atspi.CoordType.SCREEN)
-    return box.x + box.width // 2, box.y + box.height // 2
-
-
-def press(thing, times=1):
-    """Press the first pointer button over the middle of THING, once it answers to a press."""
-    until(lambda: enabled(thing), f"{thing.get_name()!r} is sensitive", 120)
-    x, y = middle(thing)
+def click(x, y, times=1):
     run("xdotool", "mousemove", str(x), str(y), "click", "--repeat", str(times), "--delay", "60",
         "1")
 
 
-def button(name, where=None):
-    """A push button by its text; stock buttons have theirs without the underscore."""
-    where = where or main()
-    return until(lambda: find(where, Role.PUSH_BUTTON, name), f"a button {name!r}")
+def settled(thing):
+    """Wait until a widget is usable and stands still; return it."""
+    def still():
+        first = again(thing)
+        return first and first["usable"] and first["mapped"] and \
+            (second := again(thing)) and second["rect"] == first["rect"] and second
+    return until(still, f"{thing['name']} {thing.get('label')} can be pressed", 120)
+
+
+def press(thing):
+    """Press the first pointer button over the middle of a widget, once it answers to a press."""
+    x, y, width, height = settled(thing)["rect"]
+    click(x + width // 2, y + height // 2)
+
+
+def press_in(window, label):
+    """Press a button of a dialog by its label."""
+    press(until(lambda: find(again(window) or window, label=label), f"a button {label!r}"))
 
 
 def fill(entry, text):
-    entry.set_text_contents(text)
+    """Type a text in place of what an entry holds."""
+    press(entry)
+    until(lambda: (again(entry) or {}).get("focus"), "the entry has the focus", 20)
+    run("xdotool", "key", "ctrl+a", "key", "BackSpace", "type", "--delay", "20", text)
+    until(lambda: text_of(again(entry)["text"]) == text,
+          lambda: f"the entry holds {text!r}, it has {text_of(again(entry)['text'])!r}", 20)
 
 
 def choose(combo, index):
-    combo.select_child(index)
-
-
-def table():
-    return find(main(), Role.TABLE)
+    """Choose an item of a combo box from its menu, with the keys."""
+    press(combo)
+    until(lambda: any(one["type"] == "GtkMenu" for window in windows() for one in walk(window)),
+          "the menu shows", 20)
+    steps = index - combo["active"]
+    for _ in range(abs(steps)):
+        run("xdotool", "key", "Down" if steps > 0 else "Up")
+    run("xdotool", "key", "Return")
+    until(lambda: again(combo)["active"] == index, "the choice is taken", 20)
 
 
 def rows():
     """The rows of the network list, five texts each."""
-    grid = table()
-    count = grid.get_n_rows()
-    return [[grid.get_accessible_at(row, column).get_name() for column in range(5)]
-            for row in range(count)]
-
-
-def names():
-    grid = table()
-    return [grid.get_accessible_at(row, 0).get_name() for row in range(grid.get_n_rows())]
-
-
-def state_of(row):
-    return table().get_accessible_at(row, 4).get_name()
+    return [[text_of(text) for text in row["texts"]]
+            for row in ask(f"rows {widget('view-press')['id']}")]
 
 
 def title():
     """The line of text above the list."""
-    for text in texts(main()):
-        if text not in ("Settings",):
-            return text
-    return None
+    return text_of(widget("title-label")["text"])
 
 
 def idle():
     """Wait until no search and no connect runs."""
-    refresh = button("Refresh")
-    until(lambda: enabled(refresh) and title() == "Wireless network selection",
-          "the window is idle", 120)
+    def is_idle():
+        top = main()
+        return top and find(top, name="button-refresh")["usable"] and \
+            text_of(find(top, name="title-label")["text"]) == IDLE
+    until(is_idle, "the window is idle", 120)
 
 
 def refresh():
-    press(button("Refresh"))
-    time.sleep(0.3)  # the search begins 100 ms after the press and blocks the window
+    press(widget("button-refresh"))
+    until(lambda: title() != IDLE or not widget("button-refresh")["usable"], "the search begins")
     idle()
 
 
 def refresh_until(wanted, what, limit=120):
     """One scan may miss a network: refresh until WANTED(rows) holds; return the rows."""
-    end_of_wait = time.monotonic() + limit
+    latest = time.monotonic() + limit
     while True:
         now = rows()
         if wanted(now):
             return now
-        if time.monotonic() > end_of_wait:
+        if time.monotonic() > latest:
             raise TimeoutError(f"{what}; the list has {now}")
         refresh()
 
 
 def select(row, times=1):
     """Press on a row of the list, twice for a double click."""
-    cell = table().get_accessible_at(row, 0)
-    x, y = middle(cell)
-    box = cell.get_extents(Atspi.CoordType.SCREEN)
-    x = box.x + min(box.width // 2, 30)
-    run("xdotool", "mousemove", str(x), str(y), "click", "--repeat", str(times), "--delay", "60",
-        "1")
+    x, y, width, height = ask(f"cell {widget('view-press')['id']} {row} 0")
+    click(x + min(width // 2, 20), y + height // 2, times)
 
 
 def notices():
     """The desktop's notices since the last call, in order."""
-    path, seen = _notices
-    with open(path) as file:
-        file.seek(seen)
+    global _seen
+    with open(f"{LOGS}/notices.log") as file:
+        file.seek(_seen)
         new = file.read()
     new = new[:new.rfind("\n") + 1]
-    _notices[1] = seen + len(new)
+    _seen += len(new)
     return re.findall(r'_NET_WIFI_CHANGE_STATUS\(STRING\) = "(\d+)"', new)
 
 
