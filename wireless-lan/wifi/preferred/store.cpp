@@ -172,10 +172,9 @@ void save_user_cell_clist()
         return;
 
     GtkWidget *window = gtk_widget_get_toplevel(front_list);
-    g_autofree gchar *message =
-        g_strdup_printf(_("The preferred networks could not be saved to %s."), USER_FILE);
 
-    show_message_box(GTK_IS_WINDOW(window) ? window : mainwindow, message);
+    show_message_box(GTK_IS_WINDOW(window) ? window : mainwindow,
+                     _("The preferred networks could not be saved."));
 }
 
 gboolean append_user_cell_row(const gchar *const ftext[LIST_COLUMNS])
