@@ -77,15 +77,14 @@ class Device:
             self.display = Display(self.state, size, window_manager)
             self._log = open(f"{self.state}/simulate.log", "wb")
             self._simulate = subprocess.Popen(
-                [f"{TOP}/device/simulate", scenario, "sh", "-c",
+                ["setpriv", "--pdeathsig", "KILL", f"{TOP}/device/simulate", scenario, "sh", "-c",
                  ": >/device/state/ready; exec sleep infinity"],
                 env={**os.environ, "SIMULATE_STATE": self.state}, stdin=subprocess.DEVNULL,
                 stdout=self._log, stderr=self._log)
             wait_until(lambda: os.path.exists(f"{self.state}/ready") or self._simulate.poll() is not None,
                        lambda: self.state_file("simulate.log").decode(), 60)
             assert self._simulate.poll() is None, self.state_file("simulate.log").decode()
-            space = _children(self._simulate.pid)[0]
-            self._init = _children(space)[0]
+            self._init = _children(self._simulate.pid)[0]
             if scan is not None:
                 self.set_scan(scan)
         except BaseException:

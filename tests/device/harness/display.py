@@ -41,7 +41,8 @@ class Display:
 
     def _start(self, command, **more):
         self._processes.append(subprocess.Popen(
-            command, stdin=subprocess.DEVNULL, stdout=self._log, stderr=self._log, **more))
+            # Nothing stays behind when the tests are killed.
+            ["setpriv", "--pdeathsig", "KILL"] + command, stdin=subprocess.DEVNULL, stdout=self._log, stderr=self._log, **more))
 
     # What clients ask of the server, in the server's own order: nothing is missed, nothing is read
     # too late, as it would be by looking at a property after the news that it changed.
