@@ -39,6 +39,12 @@ def test_an_ordinary_user_can_run_it(tmp_path):
     assert done.stdout.endswith("done\n") and not os.path.exists("/etc/mine")
 
 
+def test_a_device_begins_without_files_of_the_machine(device):
+    d = device("street")
+    assert d.sh("find /tmp -maxdepth 1 ! -type d; ls -d /etc/wireless.conf /proc/kv/iwifi 2>&1 || true") == (
+        "ls: cannot access '/etc/wireless.conf': No such file or directory\n/proc/kv/iwifi\n")
+
+
 def test_scenarios_are_named_when_one_is_missing():
     done = run(SIMULATE, "nowhere", "true")
     assert done.returncode == 1 and "street" in done.stdout
