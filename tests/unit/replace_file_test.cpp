@@ -1,0 +1,151 @@
+// Kills, full disks, mounts and foreign owners: tests/save/.
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include "support/commands.h"
+#include "wifi.h"
+
+namespace fs = std::filesystem;
+
+class ReplaceFile : public testing::Test
+{
+protected:
+    std::string folder = scratch_folder() + "/replace", file = folder + "/conf";
+    std::string cause; // of a failure
+
+    void SetUp() override
+    {
+        fs::create_directory(folder);
+    }
+    void TearDown() override
+    {
+        fs::remove_all(folder);
+    }
+    gboolean replace(const std::string &path, const std::string &content)
+    {
+        g_autoptr(GError) error = nullptr;
+        gboolean done = replace_file(path.c_str(), content.data(), content.size(), &error);
+        EXPECT_EQ(done, error == nullptr);
+        cause = error ? error->message : "";
+        return done;
+    }
+    static mode_t mode_of(const std::string &path)
+    {
+        struct stat status;
+        EXPECT_EQ(stat(path.c_str(), &status), 0);
+        return status.st_mode & 07777;
+    }
+    long entries()
+    {
+        return std::distance(fs::directory_iterator(folder), fs::directory_iterator());
+    }
+};
+
+TEST_F(ReplaceFile, MakesANewFilePrivate)
+{
+    mode_t former = umask(0);
+    EXPECT_TRUE(replace(file, "content"));
+    umask(former);
+    EXPECT_EQ(read_file(file), "content");
+    EXPECT_EQ(mode_of(file), 0600u);
+    EXPECT_EQ(entries(), 1);
+}
+
+TEST_F(ReplaceFile, ReplacesAnyContentWhole)
+{
+    for (const std::string &content :
+         {std::string(), std::string("short"), std::string(1000000, 'x'), std::string("a\0b", 3)}) {
+        EXPECT_TRUE(replace(file, content));
+        EXPECT_EQ(read_file(file), content);
+    }
+    EXPECT_EQ(entries(), 1);
+}
+
+TEST_F(ReplaceFile, KeepsTheMode)
+{
+    for (mode_t mode : {0644, 0600, 0400, 0666, 0755, 04750}) {
+        write_file(file, "old");
+        chmod(file.c_str(), mode);
+        EXPECT_TRUE(replace(file, "new"));
+        EXPECT_EQ(mode_of(file), mode);
+        fs::remove(file);
+    }
+}
+
+TEST_F(ReplaceFile, FollowsLinks)
+{
+    fs::create_directory(folder + "/real");
+    write_file(folder + "/real/target", "old");
+    fs::create_symlink("real/target", folder + "/relative");
+    fs::create_symlink(folder + "/real/target", folder + "/absolute");
+    fs::create_symlink("relative", folder + "/twice");
+    fs::create_directory_symlink("real", folder + "/by-folder");
+    for (const char *name : {"/relative", "/absolute", "/twice", "/by-folder/target"}) {
+        EXPECT_TRUE(replace(folder + name, name));
+        EXPECT_EQ(read_file(folder + "/real/target"), name);
+    }
+    EXPECT_TRUE(fs::is_symlink(folder + "/relative"));
+    EXPECT_TRUE(fs::is_symlink(folder + "/absolute"));
+    EXPECT_TRUE(fs::is_symlink(folder + "/twice"));
+    EXPECT_EQ(entries(), 5);
+}
+
+TEST_F(ReplaceFile, MakesTheFileThatALinkLeadsTo)
+{
+    fs::create_symlink("later", file);
+    EXPECT_TRUE(replace(file, "content"));
+    EXPECT_TRUE(fs::is_symlink(file));
+    EXPECT_EQ(read_file(folder + "/later"), "content");
+    EXPECT_EQ(mode_of(folder + "/later"), 0600u);
+}
+
+TEST_F(ReplaceFile, FailsOnLinksInACircle)
+{
+    fs::create_symlink("conf", folder + "/other");
+    fs::create_symlink("other", file);
+    EXPECT_FALSE(replace(file, "content"));
+    EXPECT_EQ(cause, file + ": Too many levels of symbolic links");
+    EXPECT_TRUE(fs::is_symlink(file));
+    EXPECT_EQ(entries(), 2);
+}
+
+TEST_F(ReplaceFile, SaysWhyItFails)
+{
+    EXPECT_FALSE(replace(folder, "content"));
+    EXPECT_EQ(cause, folder + ": Is a directory");
+    EXPECT_FALSE(replace(folder + "/missing/conf", "content"));
+    EXPECT_EQ(cause, folder + "/missing/conf: No such file or directory");
+    write_file(file, "old");
+    EXPECT_FALSE(replace(file + "/conf", "content"));
+    EXPECT_EQ(cause, file + "/conf: Not a directory");
+    std::string longest = folder + "/" + std::string(300, 'n');
+    EXPECT_FALSE(replace(longest, "content"));
+    EXPECT_EQ(cause, longest + ": File name too long");
+    EXPECT_EQ(entries(), 1);
+}
+
+TEST_F(ReplaceFile, LeavesADeviceADevice)
+{
+    fs::create_symlink("/dev/null", file);
+    EXPECT_FALSE(replace(file, "content"));
+    EXPECT_TRUE(fs::is_character_file("/dev/null"));
+    std::string pipe = folder + "/pipe";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    EXPECT_FALSE(replace(pipe, "content"));
+    EXPECT_TRUE(fs::is_fifo(pipe));
+}
+
+TEST_F(ReplaceFile, LeavesNoDescriptorOpen)
+{
+    std::vector<std::string> before = open_descriptors();
+    replace(file, "content");
+    replace(folder, "content");
+    replace(folder + "/missing/conf", "content");
+    EXPECT_EQ(open_descriptors(), before);
+}
