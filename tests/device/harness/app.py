@@ -323,7 +323,12 @@ class App(Pane):
                 (title is None or window["title"] == title) and \
                 (text is None or any(one.get("text") == text for one in window.walk()
                                      if one["visible"]))
-        return Pane(self, f"dialog {title or text!r}", choose).wait(limit)
+        pane = Pane(self, f"dialog {title or text!r}", choose).wait(limit)
+        if self.device.window_manager:  # and in front, with the keys
+            wait_until(lambda: (pane.now() or {"active": True})["active"] or
+                       self.props(pane.tree())["properties"]["type"] == "popup",
+                       lambda: f"the focus of {pane._describe}\n{self.sketch()}", limit)
+        return pane
 
     def dialogs(self):
         """Titles and texts of all shown windows but the main one."""

@@ -63,6 +63,7 @@ class Device:
         tools = built()
         self.state = tempfile.mkdtemp(prefix="wlan-", dir="/tmp")
         self.display = None
+        self.window_manager = window_manager
         self._simulate = None
         self.apps = []
         self.expected = []
