@@ -179,9 +179,14 @@ class Pane:
         return widget
 
     def type(self, name, text, replace=True):
-        """Clicks into an entry and types; `replace` takes away what stands there first."""
-        self.click(name)
-        wait_until(lambda: self.find(name)["focus"], f"the focus on {name}")
+        """Types into an entry, with a click into it when the focus is elsewhere; `replace` takes
+        away what stands there first."""
+        wait_until(lambda: self.tree()["active"], f"{self._describe} to be the active window")
+        # A click into the entry that has the focus would leave nothing to wait for, and the window
+        # manager may hold it back until behind the keys.
+        if not self.find(name)["focus"]:
+            self.click(name)
+            wait_until(lambda: self.find(name)["focus"], f"the focus on {name}")
         if replace:
             self.app.display.key("ctrl+a")
             self.app.display.key("Delete")
