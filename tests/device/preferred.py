@@ -53,7 +53,18 @@ def start(device, *networks, scenario="street"):
 
 def open_list(app):
     app.press("button-network-configure")
-    return app.dialog(LIST)
+    dialog = app.dialog(LIST)
+    last = []
+
+    def settled():
+        # In its place: a row is clicked by where it stands.
+        tree = dialog.tree()
+        steady = tree["active"] and last == [tree.find(FRONT)["rect"]]
+        last[:] = [tree.find(FRONT)["rect"]]
+        return steady
+
+    wait_until(settled, "the list to stand still")
+    return dialog
 
 
 def close(dialog, button):
