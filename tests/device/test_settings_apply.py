@@ -30,9 +30,9 @@ def printed_since(app, mark):
 
 
 def mark(app):
-    """From here on: nothing run, nothing told, and where the output stands."""
+    """Forgets the commands; gives where the output stands and the states sent so far."""
     app.device.clear_commands()
-    return len(app.stdout()), len(app.stderr()), len(app.device.states())
+    return len(app.stdout()), len(app.stderr()), app.device.states()
 
 
 @pytest.fixture(scope="module")
@@ -71,7 +71,7 @@ def test_refused(app, prefix, text):
     # Corrected, it is taken.
     settings.pane.type(prefix, "10.1.2.3")
     assert app.device.file(CONF).decode() == before
-    assert (commands(app.device), app.device.states()[at[2]:]) == ([], [])
+    assert (commands(app.device), app.device.states()) == ([], at[2])
     settings.ok()
     assert app.device.file(CONF).decode() == static(
         ["10.1.2.3" if one == prefix else old for one, old in zip(PREFIXES, ADDRESSES)])
@@ -173,7 +173,7 @@ def test_host_on(app, encryption):
                          "WIRELESS-LAN-DEBUG: send_atom_to_desktop [_NET_WIFI_CHANGE_STATUS]"]
     number = lines[2].split("fPID=")[1].split(",")[0]
     assert lines[2:] == [f"WIRELESS-LAN-DEBUG: wait fPID={number},exPID={number}"]
-    assert device.states()[at[2]:] == [3]
+    device.wait_states(*at[2], 3)
     assert app.text("title-label") == "Ad-Hoc Host Mode"
     assert [app.sensitive(key) for key in LIST_KEYS] == [False] * 3
     assert [app.sensitive(key) for key in OTHER_KEYS] == [True] * 2
@@ -207,7 +207,7 @@ def test_host_off_gives_the_window_back(app):
     settings.ok()
     assert app.text("title-label") == "Wireless network selection"
     assert [app.sensitive(key) for key in LIST_KEYS] == [True] * 3
-    assert device.states()[at[2]:] == [2]
+    device.wait_states(*at[2], 2)
     assert device.file(CONF).decode() == static(essid="board")
     assert commands(device) == []
     out, error = printed_since(app, at)
@@ -264,7 +264,7 @@ def test_commands_that_fail_change_nothing(app):
     at = mark(app)
     settings.ok()
     assert app.text("title-label") == "Ad-Hoc Host Mode"
-    assert device.states()[at[2]:] == [3]
+    device.wait_states(*at[2], 3)
     app.wait_printed("WIRELESS-LAN-DEBUG: wait fPID=")
     for name in ("ifconfig", "iwset", "lnk-ifup"):
         device.command(name)
@@ -308,7 +308,7 @@ def test_off_without_networks(device):
     settings = Settings(program, dhcp())
     at = mark(program)
     settings.ok()
-    assert empty.states()[at[2]:] == [2]
+    empty.wait_states(*at[2], 2)
     assert commands(empty) == []
     # Not even the access point is asked for.
     assert printed_since(program, at) == (
@@ -329,7 +329,7 @@ def test_off_without_an_answer(device):
     settings.ok()
     assert printed_since(program, at)[1].endswith(
         "send_atom_to_desktop [_NET_WIFI_CHANGE_STATUS]\n" + DISCONNECTED)
-    assert odd.states()[at[2]:] == [2]
+    odd.wait_states(*at[2], 2)
     assert commands(odd) == []
 
 
@@ -357,7 +357,7 @@ def test_off_associated(connected):
     assert app.text("title-label") == "Wireless network selection"
     assert [app.sensitive(key) for key in LIST_KEYS] == [True] * 3
     assert commands(device) == [IF_UP]
-    assert device.states()[at[2]:] == [2]
+    device.wait_states(*at[2], 2)
     error = printed_since(app, at)[1].splitlines()
     assert error[:3] == [
         "WIRELESS-LAN-DEBUG: isstatic",
@@ -379,7 +379,7 @@ def test_off_associated(connected):
     device.clock.advance(200)
     app.wait_printed(poll, 2)
     app.wait_state(1, "Connected\nIP Address:192.168.1.2")
-    assert device.states()[at[2]:] == [2, 4]
+    device.wait_states(*at[2], 2, 4)
     assert app.label("button-connect") == "gtk-disconnect"
     settings.pane.wait_gone()
 
@@ -393,7 +393,7 @@ def test_off_associated_without_an_address(connected):
     settings.ok()
     app.wait_state(1, "Connected\nIP address invalid")
     assert printed_since(app, at)[1].count("detect_network_interface_state ...") == 21
-    assert device.states()[at[2]:] == [2]
+    device.wait_states(*at[2], 2)
     assert commands(device).count(IF_UP) == 1
 
 

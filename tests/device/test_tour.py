@@ -31,11 +31,10 @@ def test_tour(device):
         d.clear_commands()
         return found
 
-    def states():
-        """The states since the last look."""
-        new = d.states()[len(seen):]
-        seen.extend(new)
-        return new
+    def sent(*states):
+        """These states since the last look, and no other."""
+        d.wait_states(*seen, *states)
+        seen.extend(states)
 
     def apply(settings):
         """OK; the new address is there before the first look at it."""
@@ -48,14 +47,14 @@ def test_tour(device):
     app = d.start()
     networks = app.wait_listed()
     assert networks[ROW] == ["Haus 14", "Master", "on", "64/100", "Disconnect"]
-    assert states() == [5]
+    sent(5)
     told()
 
     # A refresh with the same air changes nothing.
     app.press("button-refresh")
     d.wait_command("iwlist")
     assert app.wait_listed() == networks
-    assert states() == [5]
+    sent(5)
     assert told() == [["/sbin/ifconfig", "wlan0", "up"], ["iwlist", "wlan0", "scan"]]
 
     # Joining with WPA; the key is remembered under a name of its own.
@@ -69,7 +68,7 @@ def test_tour(device):
     offer.press("gtk-yes")
     app.wait_state(ROW, connected(LEASE))
     app.wait_title(IDLE)
-    assert states() == [2, 3, 4]
+    sent(2, 3, 4)
     assert told() == [["/sbin/ifconfig", "wlan0", "up"], WPA, IF_UP]
     assert d.file("/tmp/essid_tmp") == b"Haus 14\n"
     assert d.file("/tmp/key_tmp") == b"correct-horse\n"
@@ -85,7 +84,7 @@ def test_tour(device):
     apply(settings)
     app.wait_state(ROW, connected(FIXED))
     assert told() == [IF_UP]
-    assert states() == [2, 4]
+    sent(2, 4)
     assert d.file(CONF).decode() == static()
 
     # The device hosts a network of its own.
@@ -97,7 +96,7 @@ def test_tour(device):
     information.wait_gone()
     apply(settings)
     assert told() == [UP, HOST, IF_UP]
-    assert states() == [3]
+    sent(3)
     assert app.text("title-label") == "Ad-Hoc Host Mode"
     assert not any(app.sensitive(key) for key in ("view-press", "button-connect", "button-refresh"))
     assert d.file(CONF).decode() == static(host=1, essid="the board")
@@ -109,7 +108,7 @@ def test_tour(device):
     app.wait_state(ROW, connected(FIXED))
     app.wait_title(IDLE)
     assert told() == [IF_UP]
-    assert states() == [2, 4]
+    sent(2, 4)
     assert d.file(CONF).decode() == static(essid="the")
 
     # Back to DHCP.
@@ -119,14 +118,14 @@ def test_tour(device):
     apply(settings)
     app.wait_state(ROW, connected(LEASE))
     assert told() == [IF_UP]
-    assert states() == [2, 4]
+    sent(2, 4)
     assert d.file(CONF).decode() == dhcp(essid="the")
 
     # Leaving the network.
     choose(app, ROW)
     app.wait_state(ROW, "Disconnect")
     assert told() == [["/sbin/lnk-ifdown", "wlan0"]]
-    assert states() == [2]
+    sent(2)
     assert app.label("button-connect") == "gtk-connect"
     assert app.quit() == 0
 
