@@ -330,3 +330,21 @@ def test_kernel_list(device):
             app.dialog(text="No Network").press("gtk-close")
         app.wait_title(TITLE)
     assert app.quit() == 0
+
+
+def test_names_that_no_interface_has(device):
+    """Nothing is run for a name that the kernel cannot give, or that a shell would read."""
+    d = device("street")
+    app = d.start()
+    app.wait_listed()
+    for name in ("a;touch /tmp/run", "$(id)", "`id`", "a b", "a'b", "-x", "..", "a/b", "a|b", ""):
+        d.clear_commands()
+        d.set_wireless(f"Inter-| sta-\n face | tus\n {name}: 0000\n")
+        app.press("button-refresh")
+        app.dialog(text="No Network").press("gtk-close")
+        app.wait_title(TITLE)
+        assert [one.argv for one in d.commands()] == [["cat", "/proc/net/wireless"]], name
+    skipped = "WIRELESS-LAN-DEBUG: no usable interface name, skipping the scan\n"
+    assert app.stderr().count(skipped) == 10
+    assert d.file("/tmp/run") is None
+    assert app.quit() == 0

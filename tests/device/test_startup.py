@@ -197,3 +197,30 @@ def test_closing_waits_for_a_dialog(device):
     dialog.press("gtk-close")
     app.wait_title("Wireless network selection")
     assert app.quit() == 0
+
+
+def test_keyboard(device):
+    d = device("street")
+    app = d.start()
+    app.wait_listed()
+    for name in ("button-refresh", "button-wifi-settings", "button-network-configure", "view-press",
+                 "button-connect", "button-refresh"):
+        app.key("Tab")
+        wait_until(lambda: app.find(name)["focus"], f"the focus on {name}")
+    app.key("space")
+    d.wait_states(5, 5)
+    app.wait_listed()
+    app.key("alt+r")  # the mnemonic
+    d.wait_states(5, 5, 5)
+    app.wait_listed()
+    assert app.quit() == 0
+
+
+def test_a_small_screen(device):
+    d = device("connected", size="640x480")
+    app = d.start()
+    app.wait_listed()
+    assert app.props(app.tree())["properties"]["default-width"] <= 640
+    app.click_row("view-press", 1)
+    wait_until(lambda: app.label("button-connect") == "gtk-disconnect", "the button to follow")
+    assert app.quit() == 0
