@@ -1,15 +1,12 @@
 #include <cerrno>
-#include <cstdio>
 
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <glib/gstdio.h>
-
 #include "wifi.h"
 
-// A function here that returns FALSE leaves the reason in errno.
+// The functions here that return an int return 0 or the errno of what failed.
 
 // What `path` names behind symbolic links, whether it exists or not; a link when they go in
 // circles.
@@ -28,25 +25,18 @@ static gchar *resolve_links(const char *path)
     return name;
 }
 
-static gboolean write_all(int fd, const char *content, gsize length)
+static int write_all(int fd, const char *content, gsize length)
 {
     while (length > 0) {
         gssize written = write(fd, content, length);
         if (written < 0 && errno == EINTR)
             continue;
         if (written < 0)
-            return FALSE;
+            return errno;
         content += written;
         length -= static_cast<gsize>(written);
     }
-    return TRUE;
-}
-
-static void close_quietly(int fd)
-{
-    int reason = errno;
-    close(fd);
-    errno = reason;
+    return 0;
 }
 
 // The new name itself is on the disk only once the folder is.
@@ -60,51 +50,67 @@ static void sync_folder(const char *target)
     close(fd);
 }
 
-// `old` is NULL when there is no file to take mode and owner from. A change of owner can clear mode
-// bits, so it comes first.
-static gboolean write_and_rename(const char *target, const struct stat *old, const char *content,
-                                 gsize length)
+// Fills a file beside the target. `old` is NULL when there is no mode and owner to keep. A change
+// of owner can clear bits of the mode, so it comes first.
+static int fill(int fd, const struct stat *old, const char *content, gsize length)
+{
+    if (old && fchown(fd, old->st_uid, old->st_gid) != 0)
+        return errno;
+    if (old && fchmod(fd, old->st_mode & 07777) != 0)
+        return errno;
+    int reason = write_all(fd, content, length);
+    if (reason == 0 && fsync(fd) != 0)
+        reason = errno;
+    return reason;
+}
+
+static int write_and_rename(const char *target, const struct stat *old, const char *content,
+                            gsize length)
 {
     g_autofree gchar *name = g_strconcat(target, ".XXXXXX", nullptr);
     int fd = g_mkstemp_full(name, O_WRONLY | O_CLOEXEC, 0600);
     if (fd < 0)
-        return FALSE;
-    gboolean done = (!old || fchown(fd, old->st_uid, old->st_gid) == 0) &&
-                    (!old || fchmod(fd, old->st_mode & 07777) == 0) &&
-                    write_all(fd, content, length) && fsync(fd) == 0;
-    close_quietly(fd);
-    if (!done || rename(name, target) != 0) {
-        int reason = errno;
+        return errno;
+    int reason = fill(fd, old, content, length);
+    close(fd);
+    if (reason == 0 && rename(name, target) != 0)
+        reason = errno;
+    if (reason == 0)
+        sync_folder(target);
+    else
         unlink(name);
-        errno = reason;
-        return FALSE;
-    }
-    sync_folder(target);
-    return TRUE;
+    return reason;
 }
 
-// Makes room for `length` bytes; the file is as before when there is none.
-static gboolean reserve(int fd, gsize length)
+static int overwrite(int fd, const char *content, gsize length)
 {
-    struct stat old;
-    if (fstat(fd, &old) != 0)
-        return FALSE;
-    int reason = length > 0 ? posix_fallocate(fd, 0, static_cast<off_t>(length)) : 0;
-    if (reason != 0 && ftruncate(fd, old.st_size) == 0)
-        errno = reason;
-    return reason == 0;
+    if (lseek(fd, 0, SEEK_SET) != 0)
+        return errno;
+    int reason = write_all(fd, content, length);
+    if (reason == 0 && (ftruncate(fd, static_cast<off_t>(length)) != 0 || fsync(fd) != 0))
+        reason = errno;
+    return reason;
 }
 
-// The room is reserved before a byte of the old content goes, so that a full disk keeps it.
-static gboolean write_in_place(const char *target, const char *content, gsize length)
+// The room is reserved before a byte of the old content goes, and the old content is put back when
+// the new one cannot be written: only a power cut can leave half a file here.
+static int write_in_place(const char *target, const char *content, gsize length)
 {
     int fd = open(target, O_RDWR | O_CLOEXEC);
     if (fd < 0)
-        return FALSE;
-    gboolean done = reserve(fd, length) && write_all(fd, content, length) &&
-                    ftruncate(fd, static_cast<off_t>(length)) == 0 && fsync(fd) == 0;
-    close_quietly(fd);
-    return done;
+        return errno;
+    g_autofree gchar *old = nullptr;
+    gsize old_length = 0;
+    int reason = EIO;
+    if (g_file_get_contents(target, &old, &old_length, nullptr)) {
+        reason = length > 0 ? posix_fallocate(fd, 0, static_cast<off_t>(length)) : 0;
+        if (reason == 0)
+            reason = overwrite(fd, content, length);
+        if (reason != 0)
+            overwrite(fd, old, old_length);
+    }
+    close(fd);
+    return reason;
 }
 
 // Whether a file can still be written in place when renaming over it failed for this reason: a
@@ -115,19 +121,28 @@ static gboolean may_write_in_place(int reason)
            reason == EXDEV;
 }
 
+// Nothing is put in the place of a folder, a device or links in a circle.
+static int check_type(mode_t mode)
+{
+    if (S_ISREG(mode))
+        return 0;
+    if (S_ISDIR(mode))
+        return EISDIR;
+    return S_ISLNK(mode) ? ELOOP : ENOTSUP;
+}
+
 gboolean replace_file(const char *path, const char *content, gsize length, GError **error)
 {
     g_autofree gchar *target = resolve_links(path);
     struct stat old;
     gboolean exists = lstat(target, &old) == 0;
-    gboolean renamable = !exists || S_ISREG(old.st_mode); // never put a file in a device's place
-    gboolean done = renamable && write_and_rename(target, exists ? &old : nullptr, content, length);
-    if (!done && exists && (!renamable || may_write_in_place(errno)))
-        done = write_in_place(target, content, length);
-    if (!done) {
-        int reason = errno;
+    int reason = exists ? check_type(old.st_mode) : errno;
+    if (reason == 0 || reason == ENOENT)
+        reason = write_and_rename(target, exists ? &old : nullptr, content, length);
+    if (exists && may_write_in_place(reason))
+        reason = write_in_place(target, content, length);
+    if (reason != 0)
         g_set_error(error, G_FILE_ERROR, g_file_error_from_errno(reason), "%s: %s", path,
                     g_strerror(reason));
-    }
-    return done;
+    return reason == 0;
 }

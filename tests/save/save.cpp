@@ -1,0 +1,37 @@
+// Saves one of the two files and nothing else: save basic|preferred FILE old|new|short. Exit status
+// 0: saved, 1: not saved, the cause stands on standard error.
+
+#include <cstring>
+
+#include <unistd.h>
+
+#include "support/state.h"
+
+static void fill(char *field, gsize size, char byte)
+{
+    memset(field, byte, size - 1);
+}
+
+int main(int argc, char **argv)
+{
+    if (argc != 4)
+        return 2;
+    fresh_state();
+    WIFI_INTERFACE *iface = add_interface("wlan0");
+    char byte = argv[3][0];
+    bool is_short = strcmp(argv[3], "short") == 0;
+    iface->isdhcp = is_short;
+    iface->isstatic = !is_short;
+    fill(static_address, sizeof static_address, byte);
+    fill(iface->wifi_group.essid, is_short ? 4 : 128, byte);
+    for (int i = 0; i < (is_short ? 2 : 64); i++) {
+        WIFI_CELL *cell = add_preferred();
+        fill(cell->alias, sizeof cell->alias, byte);
+        fill(cell->essid, sizeof cell->essid, byte);
+    }
+    getppid(); // the save begins behind this system call
+    bool basic = strcmp(argv[1], "basic") == 0;
+    gboolean saved = basic ? save_basic_setting_to_file(argv[2])
+                           : save_preferred_network_to_file(argv[2]);
+    return saved ? 0 : 1;
+}
