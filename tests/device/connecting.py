@@ -76,6 +76,15 @@ def answer_key(app, key, authentication=None, index=None, offer="gtk-no"):
     dialog.wait_gone()
 
 
+def type_answer(app, question, text):
+    """Types into a question's entry, which has the focus from the start."""
+    entry = lambda: question.find(type="GtkEntry")
+    assert entry()["text"] == ""
+    wait_until(lambda: entry()["focus"], "the focus on the question's entry")
+    app.display.type(text)
+    wait_until(lambda: entry()["text"] == text, lambda: f"{text!r}; it holds {entry()['text']!r}")
+
+
 def _passing(d, app, marks, milliseconds, times, expect):
     def seen():
         printed = app.stderr()
