@@ -19,7 +19,7 @@ from air import AIR, FAR, network, run, until
 # A name that would do harm if a shell read it, as long as a name can be less one byte.
 SHELL_NAME = b"$(touch /tmp/x)\"\\';&|<`>/tmp/y`"
 SHELL_KEY = "it's `id` \"$HOME\" \\ ; & #"
-UTF8_NAME = "Café Zürich 网络"
+UTF8_NAME = "Café Zürich Москва"
 
 
 def check(condition, reason):

@@ -24,8 +24,10 @@ def begin():
     """Start the program and the watch on the desktop's notices. Return when its window shows."""
     global _program, _answers, _seen
     if not hasattr(begin, "watch"):
+        # xprop follows only what is there.
+        run("xprop", "-root", "-f", "_NET_WIFI_CHANGE_STATUS", "8s", "-set",
+            "_NET_WIFI_CHANGE_STATUS", "none")
         begin.watch = start("xprop", "-root", "-spy", "_NET_WIFI_CHANGE_STATUS", log="notices.log")
-        # The property is told once, set or not, before its changes are followed.
         until(lambda: os.path.getsize(f"{LOGS}/notices.log"), "xprop watches the root window")
     _seen = os.path.getsize(f"{LOGS}/notices.log")
     if os.path.exists(SOCKET):
