@@ -117,7 +117,7 @@ def test_a_whole_connect_and_back(device):
             "WIRELESS-LAN-DEBUG: interface:wlan0\n") in app.stderr()
 
     # An access point: the address script starts, nobody's child.
-    d.command("lnk-ifup", delay=0.2, hook=":")
+    d.command("lnk-ifup", hook="while [ ! -e /device/state/go ]; do sleep 0.01; done")
     d.associate(address_of(1))
     poll_link(d, app)
     assert settle(app) == ACQUIRING
@@ -125,6 +125,8 @@ def test_a_whole_connect_and_back(device):
     d.wait_states(5, 5, 2, 3)
     for name in LOCKED:
         assert not app.sensitive(name)
+    d.wait_command("lnk-ifup", ended=False)
+    d._put("go", "")
     script = d.wait_command("lnk-ifup")
     assert script.path == "/sbin/lnk-ifup" and script.argv == ["lnk-ifup", "wlan0"]
     assert script.end_parent == 1

@@ -259,7 +259,7 @@ class Device:
         if missing:
             self.remove(path)
         elif not os.path.exists(self.outer(path)):
-            shutil.copy(self.outer("/usr/sbin/iwset"), self.outer(path))
+            shutil.copy(f"{built()}/command", self.outer(path))
 
     def associate(self, mac, after=0, count=None):
         """Joins an access point: `after` further requests still find none; for `count` requests."""
