@@ -1,0 +1,401 @@
+"""Takes the measurements on the simulated device and prints the table. Started by ./run.
+
+    measure.py BUILD [STARTS [REFRESHES]]
+
+BUILD is the build folder. What each line of the table means stands in README.md.
+"""
+
+import os
+import pathlib
+import re
+import statistics
+import subprocess
+import sys
+
+STATE = pathlib.Path("/device/state")
+PROC = pathlib.Path("/proc/.kernel")
+
+BUILD = pathlib.Path(sys.argv[1])
+STARTS = int(sys.argv[2]) if len(sys.argv) > 2 else 15
+REFRESHES = int(sys.argv[3]) if len(sys.argv) > 3 else 1000
+IDLE_SECONDS = 10
+COUNTED_STARTS = 3
+
+TOOLS = BUILD / "bench"
+PROGRAM = BUILD / "wireless-lan" / "wireless-lan"
+# Nothing more is drawn after so many milliseconds without drawing; the pause before the scan is 100.
+QUIET = 400
+
+rows = []
+
+
+def progress(text):
+    print("bench: " + text, file=sys.stderr, flush=True)
+
+
+def report(what, measured, limit="", within=None):
+    """One line of the table. `within` is None where there is nothing to keep within."""
+    rows.append((what, measured, limit, "" if within is None else "yes" if within else "NO"))
+
+
+def missing(what, reason):
+    rows.append((what, "not measured: " + str(reason), "", "?"))
+
+
+# --- the device ---------------------------------------------------------------------------------
+
+
+def put(name, text):
+    (STATE / (name + ".new")).write_text(text)
+    (STATE / (name + ".new")).rename(STATE / name)
+
+
+def set_interfaces(count):
+    put("wireless", "Inter-| sta-|   Quality        |   Discarded packets               | Missed | WE\n"
+        " face | tus | link level noise |  nwid  crypt   frag  retry   misc | beacon | 22\n"
+        + " wlan0: 0000    0     0     0        0      0      0      0      0        0\n" * count)
+
+
+def set_networks(count):
+    text = ["wlan0     Scan completed :\n"]
+    for number in range(1, count + 1):
+        channel = number % 11 + 1
+        text.append(
+            f"          Cell {number:02d} - Address: 02:00:00:00:{number // 256:02X}:{number % 256:02X}\n"
+            f"                    ESSID:\"network {number:03d}\"\n"
+            "                    Mode:Master\n"
+            f"                    Frequency:{(2407 + 5 * channel) / 1000:.3f} GHz (Channel {channel})\n"
+            f"                    Quality:{number % 100}/100  Signal level:-60 dBm  Noise level:-95 dBm\n"
+            f"                    Encryption key:{'on' if number % 3 == 0 else 'off'}\n"
+            "                    Bit Rates:54 Mb/s\n")
+    put("scan", "".join(text))
+
+
+# --- one start of one program -------------------------------------------------------------------
+
+
+class Failure(Exception):
+    pass
+
+
+class Start:
+    """A program under watch."""
+
+    def __init__(self, *command):
+        self.name = " ".join(os.path.basename(word) for word in map(str, command))
+        self.watch = subprocess.Popen([TOOLS / "watch", STATE / "log", *map(str, command)],
+                                      stdin=subprocess.PIPE, stdout=subprocess.PIPE, text=True)
+        pid = self.watch.stdout.readline()
+        if not pid:
+            raise Failure("watch did not start")
+        self.pid = int(pid)
+
+    def ask(self, command):
+        self.watch.stdin.write(command + "\n")
+        self.watch.stdin.flush()
+        answer = []
+        while True:
+            line = self.watch.stdout.readline()
+            if line == "ok\n":
+                return answer
+            if line in ("", "failed\n"):
+                self.watch.stdin.close()
+                self.watch.wait()
+                raise Failure(f"{self.name}: {command}")
+            answer.append(line.split())
+
+    def settle(self, scans):
+        """What was drawn until the last scan is shown: [(ms, (x, y, width, height))]."""
+        return [(float(line[1]), tuple(map(int, line[2:])))
+                for line in self.ask(f"settle {QUIET} {scans}")]
+
+    def window(self):
+        return tuple(map(int, self.ask("window")[0]))
+
+    def picture(self):
+        return self.ask("picture")[0][0]
+
+    def close(self):
+        """CPU time in ms."""
+        status, used = self.ask("close")[0]
+        self.watch.wait()
+        if status != "0":
+            raise Failure(f"{self.name} left with status {status}")
+        return float(used)
+
+    def memory(self):
+        """PSS and private dirty memory, KiB."""
+        text = (PROC / str(self.pid) / "smaps_rollup").read_text()
+        return tuple(int(re.search(rf"^{field}:\s+(\d+) kB", text, re.M)[1])
+                     for field in ("Pss", "Private_Dirty"))
+
+    def descriptors(self):
+        return len(os.listdir(PROC / str(self.pid) / "fd"))
+
+    def libraries(self):
+        text = (PROC / str(self.pid) / "maps").read_text()
+        return {path for path in re.findall(r"(/\S+\.so[^/\s]*)$", text, re.M)}
+
+    def activity(self):
+        """Voluntary and involuntary context switches, and CPU time in ms."""
+        folder = PROC / str(self.pid)
+        status = (folder / "status").read_text()
+        switches = [int(re.search(rf"^{kind}_ctxt_switches:\s+(\d+)", status, re.M)[1])
+                    for kind in ("voluntary", "nonvoluntary")]
+        return (*switches, int((folder / "schedstat").read_text().split()[0]) / 1e6)
+
+
+def without(area, hole):
+    """The parts of a rectangle outside another one."""
+    x, y, w, h = area
+    left, top = max(x, hole[0]), max(y, hole[1])
+    right, bottom = min(x + w, hole[0] + hole[2]), min(y + h, hole[1] + hole[3])
+    if left >= right or top >= bottom:
+        return [area]
+    parts = [(x, y, w, top - y), (x, bottom, w, y + h - bottom), (x, top, left - x, bottom - top),
+             (right, top, x + w - right, bottom - top)]
+    return [part for part in parts if part[2] > 0 and part[3] > 0]
+
+
+def first_picture(drawn, window):
+    """When every pixel of the window had been drawn by the program. The first piece is the display
+    server's: the background of the new window."""
+    if not drawn or drawn[0][1] != window:
+        raise Failure("the window's background was not seen")
+    open_parts = [window]
+    for when, area in drawn[1:]:
+        open_parts = [rest for part in open_parts for rest in without(part, area)]
+        if not open_parts:
+            return when
+    raise Failure("the window was never drawn as a whole")
+
+
+# --- the measurements ---------------------------------------------------------------------------
+
+
+def median(values):
+    return statistics.median(values)
+
+
+def spread(values):
+    low, _, high = statistics.quantiles(values, n=4)
+    return f"{median(values):.1f} ms (quartiles {low:.1f}, {high:.1f})"
+
+
+class Case:
+    """One program in one situation, started again and again."""
+
+    def __init__(self, command, interfaces, scans):
+        self.command, self.interfaces, self.scans = command, interfaces, scans
+        self.picture_ms, self.last_ms, self.pss, self.dirty, self.cpu = [], [], [], [], []
+        self.shown = self.libraries = None
+
+    def run(self):
+        set_interfaces(self.interfaces)
+        start = Start(*self.command)
+        drawn = start.settle(self.scans)
+        self.picture_ms.append(first_picture(drawn, start.window()))
+        self.last_ms.append(drawn[-1][0])
+        pss, dirty = start.memory()
+        self.pss.append(pss)
+        self.dirty.append(dirty)
+        self.shown, self.libraries = start.picture(), start.libraries()
+        self.cpu.append(start.close())
+
+
+def program_size():
+    """Width and height of the program's window: the floors get the same."""
+    set_interfaces(0)
+    start = Start(PROGRAM)
+    start.settle(0)
+    size = start.window()[2:]
+    start.close()
+    return size
+
+
+def ratio(what, value, floor, limit, digits=3):
+    measured = median(value) / median(floor)
+    report(what, f"{measured:.{digits}f} x", f"{limit:.2f} x", measured <= limit)
+
+
+def starts(size):
+    cases = {
+        "empty": Case((TOOLS / "empty",), 0, 0),
+        "widgets": Case((TOOLS / "widgets", *size), 0, 0),
+        "program, no interface": Case((PROGRAM,), 0, 0),
+        "refresh": Case((TOOLS / "refresh", *size), 1, 1),
+        "program": Case((PROGRAM,), 1, 1),
+    }
+    set_networks(128)
+    for case in cases.values():
+        case.run()
+        case.__init__(case.command, case.interfaces, case.scans)  # the first one warms the caches
+    for number in range(STARTS):
+        progress(f"start {number + 1} of {STARTS}")
+        for case in cases.values():
+            case.run()
+    return cases
+
+
+def report_starts(cases):
+    empty, widgets, bare, refresh, program = cases.values()
+    for name, case in cases.items():
+        report(f"first whole picture: {name}", spread(case.picture_ms))
+    for name in ("refresh", "program"):
+        report(f"filled list, 128 networks: {name}", spread(cases[name].last_ms))
+    for name, case in cases.items():
+        report(f"CPU time of it and its commands: {name}", spread(case.cpu))
+    ratio("start to first whole picture, no interface / widgets", bare.picture_ms,
+          widgets.picture_ms, 1.05)
+    ratio("start to first whole picture, interface / widgets", program.picture_ms,
+          widgets.picture_ms, 1.20)
+    ratio("start to filled list, 128 networks / refresh", program.last_ms, refresh.last_ms, 1.03)
+    report("list shown, pixel by pixel / refresh",
+           "the same" if program.shown == refresh.shown else "another")
+    for name, case in cases.items():
+        report(f"memory: {name}", f"PSS {median(case.pss):.0f}, private dirty "
+               f"{median(case.dirty):.0f} KiB")
+    more = median(program.dirty) - median(widgets.dirty)
+    report("private dirty memory, 128 networks listed - widgets", f"{more:.0f} KiB", "64 KiB",
+           more <= 64)
+    report("the same for refresh - widgets",
+           f"{median(refresh.dirty) - median(widgets.dirty):.0f} KiB")
+    others = sorted(program.libraries - widgets.libraries)
+    report("shared libraries loaded beyond widgets'",
+           f"{len(others)} {' '.join(map(os.path.basename, others))} (of {len(program.libraries)})",
+           "0", not others)
+
+
+def instructions(size):
+    counts = {"refresh": [], "program": []}
+    commands = {"refresh": (TOOLS / "refresh", *size), "program": (PROGRAM,)}
+    set_interfaces(1)
+    set_networks(128)
+    for number in range(COUNTED_STARTS):
+        for name, command in commands.items():
+            progress(f"instruction count {number + 1} of {COUNTED_STARTS}: {name}")
+            out = STATE / f"callgrind.{name}"
+            start = Start("valgrind", "-q", "--tool=callgrind", f"--callgrind-out-file={out}",
+                          *command)
+            start.settle(1)
+            start.close()
+            counts[name].append(int(re.search(r"^totals: (\d+)", out.read_text(), re.M)[1]))
+    for name, values in counts.items():
+        report(f"instructions, start to filled list and end: {name}", f"{median(values) / 1e6:.1f} M")
+    ratio("instructions / refresh", counts["program"], counts["refresh"], 1.03)
+
+
+def idle(size):
+    set_interfaces(1)
+    set_networks(128)
+    for name, command, scans in (("widgets", (TOOLS / "widgets", *size), 0),
+                                 ("program", (PROGRAM,), 1)):
+        progress(f"idle, {IDLE_SECONDS} s: {name}")
+        start = Start(*command)
+        start.settle(scans)
+        before = start.activity()
+        subprocess.run(["sleep", str(IDLE_SECONDS)], check=True)
+        woken, pushed, used = (now - then for now, then in zip(start.activity(), before))
+        start.close()
+        limit = name == "program"
+        report(f"idle, {IDLE_SECONDS} s: {name}",
+               f"{woken} wake-ups, {pushed} preemptions, {used:.1f} ms CPU",
+               "0, 0 ms" if limit else "", woken == 0 and used == 0 if limit else None)
+
+
+def refreshes():
+    set_interfaces(1)
+    set_networks(128)
+    start = Start(PROGRAM)
+    start.settle(1)
+
+    def look(count):
+        progress(f"refreshes: {count}")
+        start.ask(f"refresh {count}")
+        start.settle(0)
+        return (*start.memory(), start.descriptors())
+
+    few = look(10)
+    many = look(REFRESHES - 10)
+    start.close()
+    for name, value in (("10", few), (str(REFRESHES), many)):
+        report(f"after {name} refreshes", f"PSS {value[0]}, private dirty {value[1]} KiB, "
+               f"{value[2]} descriptors")
+    report(f"growth from 10 to {REFRESHES} refreshes",
+           f"{many[1] - few[1]} KiB, {many[2] - few[2]} descriptors", "0, 0",
+           many[1] <= few[1] and many[2] <= few[2])
+
+
+def scan_cost():
+    costs = {}
+    for count in (10, 128, 10000):
+        progress(f"get_cell: {count} networks")
+        set_networks(count)
+        done = subprocess.run([TOOLS / "scan_cost", str(4 * STARTS)], stdout=subprocess.PIPE,
+                              stderr=subprocess.DEVNULL, text=True, check=True)
+        lines = [line.split() for line in done.stdout.splitlines()]
+        pipe, own = (median([float(us) for name, us in lines if name == kind])
+                     for kind in ("pipe", "get_cell"))
+        costs[count] = (pipe, own)
+        what = f"get_cell, {count} networks / a pipe"
+        measured = f"{own / pipe:.3f} x ({own:.0f} us, the pipe {pipe:.0f} us)"
+        if count == 128:
+            report(what, measured, "1.15 x", own / pipe <= 1.15)
+        else:
+            report(what, measured)
+    pipe, own = ((costs[10000][i] - costs[128][i]) / (10000 - 128) for i in (0, 1))
+    report("per further network past 128", f"{own:.2f} us, the pipe {pipe:.2f} us",
+           "that of the pipe", own <= pipe)
+
+
+def refill():
+    samples = {"floor": [], "program": []}
+    set_interfaces(1)
+    set_networks(128)
+    for number in range(STARTS):
+        progress(f"refill {number + 1} of {STARTS}")
+        for name, values in samples.items():
+            done = subprocess.run([TOOLS / "refill", name, "20"], stdout=subprocess.PIPE,
+                                  stderr=subprocess.DEVNULL, text=True, check=True)
+            values.append(median(list(map(float, done.stdout.split()))))
+    for name, values in samples.items():
+        report(f"refill of 128 shown rows: {name}", f"{median(values) / 1000:.2f} ms")
+    ratio("refill of 128 shown rows / floor", samples["program"], samples["floor"], 1.05)
+
+
+def size_of_program():
+    stripped = STATE / "stripped"
+    subprocess.run(["strip", "-o", stripped, PROGRAM], check=True)
+    size = stripped.stat().st_size
+    report("stripped executable", f"{size / 1024:.1f} KiB", "80 KiB", size <= 80 * 1024)
+
+
+def print_table():
+    headings = ("what", "measured", "limit", "within")
+    widths = [max(len(row[i]) for row in [headings, *rows]) for i in range(4)]
+    for row in [headings, tuple("-" * width for width in widths), *rows]:
+        print("| " + " | ".join(text.ljust(width) for text, width in zip(row, widths)) + " |")
+
+
+def main():
+    size = program_size()
+    cases = {}
+
+    def run_starts():
+        cases.update(starts(size))
+        report_starts(cases)
+
+    for what, measure in (("starts", run_starts), ("instructions", lambda: instructions(size)),
+                          ("refreshes", refreshes), ("idle", lambda: idle(size)),
+                          ("get_cell", scan_cost), ("refill", refill),
+                          ("size", size_of_program)):
+        try:
+            measure()
+        except (Failure, OSError, subprocess.SubprocessError, TypeError) as reason:
+            missing(what, reason)
+    print_table()
+    return any(row[3] == "?" for row in rows)
+
+
+if __name__ == "__main__":
+    sys.exit(main())
