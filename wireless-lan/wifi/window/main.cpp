@@ -32,13 +32,11 @@ static void cb_leave(GtkWidget *, gpointer)
     gtk_main_quit();
 }
 
+static guint unseen_timer = 0; // 0: the start-up jobs are queued
+
 static gboolean start_jobs(gpointer)
 {
-    static gboolean started = FALSE;
-
-    if (started)
-        return FALSE;
-    started = TRUE;
+    unseen_timer = 0;
     g_idle_add(
         [](gpointer) -> gboolean {
             cb_active_device(nullptr, nullptr);
@@ -55,7 +53,10 @@ static gboolean cb_first_exposure(GtkWidget *widget, GdkEvent *, gpointer handle
 {
     g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_exposure),
                                          handler);
-    start_jobs(nullptr);
+    if (unseen_timer != 0) {
+        g_source_remove(unseen_timer);
+        start_jobs(nullptr);
+    }
     return FALSE;
 }
 
@@ -87,7 +88,7 @@ int main(int argc, char **argv)
     set_default_width(GTK_WINDOW(mainwindow));
 
     g_signal_connect(mainwindow, "expose-event", G_CALLBACK(cb_first_exposure), nullptr);
-    g_timeout_add(UNSEEN_MS, start_jobs, nullptr);
+    unseen_timer = g_timeout_add(UNSEEN_MS, start_jobs, nullptr);
     gtk_widget_show_all(mainwindow);
     gtk_main();
     return EXIT_SUCCESS;

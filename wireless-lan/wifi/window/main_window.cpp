@@ -116,15 +116,23 @@ GtkWidget *create_list()
 
 void set_default_width(GtkWindow *window)
 {
-    GtkListStore *store =
-        GTK_LIST_STORE(gtk_tree_view_get_model(GTK_TREE_VIEW(my_wifi->wifi_view)));
+    // A view takes the height of the first rows that it ever measures in a model as that of all the
+    // others, and so knows at once how long the list is; the sample must not use that up.
+    GtkTreeView *view = GTK_TREE_VIEW(my_wifi->wifi_view);
+    GtkTreeModel *model = gtk_tree_view_get_model(view);
+    GtkTreeModel *sample = create_model();
     g_autofree gchar *state =
         g_strdup_printf("%s:%s", _("Connected\nIP Address"), "255.255.255.255");
     GtkRequisition list, whole;
 
-    model_data_new(store, "a network's usual name", "Managed", "off", "100/100", state);
+    model_data_new(GTK_LIST_STORE(sample), "a network's usual name", "Managed", "off", "100/100",
+                   state);
+    g_object_ref(model);
+    gtk_tree_view_set_model(view, sample);
     gtk_widget_size_request(my_wifi->wifi_view, &list);
-    gtk_list_store_clear(store);
+    gtk_tree_view_set_model(view, model);
+    g_object_unref(model);
+    g_object_unref(sample);
     gtk_widget_size_request(GTK_WIDGET(window), &whole);
     gtk_window_set_default_size(window,
                                 MIN(whole.width - LIST_SIDE_WIDTH + LIST_SIDE_MARGIN + list.width,
