@@ -117,7 +117,7 @@ def test_a_whole_connect_and_back(device):
             "WIRELESS-LAN-DEBUG: interface:wlan0\n") in app.stderr()
 
     # An access point: the address script starts, nobody's child.
-    d.command("lnk-ifup", hook="while [ ! -e /device/state/go ]; do sleep 0.01; done")
+    d.command("lnk-ifup", hook="until [ -e /device/state/go ]; do :; done")
     d.associate(address_of(1))
     poll_link(d, app)
     assert settle(app) == ACQUIRING
