@@ -219,8 +219,8 @@ void get_paramval(gchar *source, gchar *keyword, gchar *ret);
 // stands then and standard error has the cause.
 gboolean save_preferred_network_to_file(const gchar *file);
 
-// Rebuilds user_wifi_cell and user_cell_count from the file, 64 networks at most. A file that
-// cannot be opened changes nothing.
+// Rebuilds user_wifi_cell and user_cell_count from the file. A 65th network is read over and
+// dropped, which one line on standard error says. A file that cannot be opened changes nothing.
 void get_preferred_network_setting_from_file(const gchar *file);
 
 #endif

@@ -31,7 +31,7 @@ int main(int argc, char **argv)
     }
     getppid(); // the save begins behind this system call
     bool basic = strcmp(argv[1], "basic") == 0;
-    gboolean saved = basic ? save_basic_setting_to_file(argv[2])
-                           : save_preferred_network_to_file(argv[2]);
+    gboolean saved =
+        basic ? save_basic_setting_to_file(argv[2]) : save_preferred_network_to_file(argv[2]);
     return saved ? 0 : 1;
 }
