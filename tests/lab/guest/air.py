@@ -102,7 +102,7 @@ def access_point(radio, channel, networks, beacon=50):
     for index, one in enumerate(networks):
         if one["net"] is not None:
             device = f"{first}_{index}" if index else first
-            run("ip", "addr", "add", f"10.9.{one['net']}.1/24", "dev", device, netns=AIR)
+            run("ip", "addr", "replace", f"10.9.{one['net']}.1/24", "dev", device, netns=AIR)
     return process
 
 

@@ -5,7 +5,6 @@ the pointer and the keys."""
 import json
 import os
 import re
-import shutil
 import socket
 import subprocess
 import time
@@ -196,9 +195,13 @@ def title():
 
 
 def idle():
-    """Wait until no search and no connect runs."""
+    """Wait until no search and no connect runs; a search that found nothing says so."""
     def is_idle():
         top = main()
+        for one in windows():
+            if "No Network" in texts(one):
+                press_in(one, "gtk-close")
+                gone(one)
         return top and find(top, name="button-refresh")["usable"] and \
             text_of(find(top, name="title-label")["text"]) == IDLE
     until(is_idle, "the window is idle", 120)
@@ -240,5 +243,15 @@ def notices():
 
 
 def photograph(name):
-    """Keep what the screen shows; tests/lab/run makes a picture of it."""
-    shutil.copy("/tmp/screen/Xvfb_screen0", f"{LOGS}/{name}.xwd")
+    """Keep what the screen shows once it stands still; tests/lab/run makes a picture of it."""
+    path = f"{LOGS}/{name}.xwd"
+    before = None
+    for _ in range(20):
+        with open("/tmp/screen/Xvfb_screen0", "rb") as file:
+            now = file.read()
+        if now == before:
+            break
+        before = now
+        time.sleep(0.5)
+    with open(path, "wb") as file:
+        file.write(now)
