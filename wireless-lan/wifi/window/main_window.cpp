@@ -131,6 +131,7 @@ void set_default_width(GtkWindow *window)
     gtk_tree_view_set_model(view, sample);
     gtk_widget_size_request(my_wifi->wifi_view, &list);
     gtk_tree_view_set_model(view, model);
+    gtk_tree_view_columns_autosize(view);
     g_object_unref(model);
     g_object_unref(sample);
     gtk_widget_size_request(GTK_WIDGET(window), &whole);
