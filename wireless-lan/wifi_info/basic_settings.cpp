@@ -5,8 +5,7 @@
 #include "wifi_info/readers.h"
 #include "wifi_info/text.h"
 
-constexpr int LINE_SIZE = 256;
-constexpr int LINE_LIMIT = 255;
+constexpr int LINE_SIZE = 255;
 
 // The address lines, in the order of the file; each value has 32 bytes.
 static const struct {
@@ -67,7 +66,7 @@ gboolean save_basic_setting_to_file(const gchar *file)
 // Reads the next line and trims it. Behind the last line the former one stays, to be read again.
 static gboolean next_line(FILE *stream, char *line)
 {
-    if (!fgets(line, LINE_LIMIT, stream))
+    if (!fgets(line, LINE_SIZE, stream))
         return FALSE;
     g_strstrip(line);
     return TRUE;
@@ -140,7 +139,7 @@ static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
     if (get_value(line, "ESSID", value))
         copy_field(group->essid, sizeof group->essid, value);
     next_line(stream, line);
-    // Whatever the file says; a mode that is not "Ad-Hoc" is what users of the record rely on.
+    // Whatever the file says, in this very spelling: readers of the record rely on it.
     copy_field(group->mode, sizeof group->mode, "Ad-Hos");
     next_line(stream, line);
     if (get_value(line, "KEY", value))
