@@ -231,6 +231,15 @@ def select(row, times=1):
     click(x + min(width // 2, 20), y + height // 2, times)
 
 
+def select_surely(row):
+    """Press on a row until it is selected: a press while the rows are written anew finds none."""
+    def selected():
+        select(row)
+        time.sleep(0.3)
+        return ask(f"rows {widget('view-press')['id']}")[row]["selected"]
+    until(selected, f"row {row} is selected", 20)
+
+
 def notices():
     """The desktop's notices since the last call, in order."""
     global _seen
