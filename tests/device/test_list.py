@@ -161,7 +161,8 @@ def test_match_with_the_access_point(device):
 
     d.associate("02:00:00:00:00:03")
     refresh(app)
-    assert states(app) == ["Disconnect"] * 2 + ["Connected\nIP address invalid"] + ["Disconnect"] * 5
+    assert states(app) == (["Disconnect"] * 2 + ["Connected\nIP address invalid"] +
+                           ["Disconnect"] * 5)
     d.address("10.11.12.13")
     refresh(app)
     assert states(app)[2] == "Connected\nIP Address:10.11.12.13"

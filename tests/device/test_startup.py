@@ -10,8 +10,10 @@ from harness import wait_until
 from harness.device import TOP
 
 BUTTONS = {
-    "button-refresh": ("gtk-refresh", 1), "button-wifi-settings": ("WLAN Setting", 3),
-    "button-network-configure": ("Preferred Network", 5), "button-active-device": ("Active WIFI", 7),
+    "button-refresh": ("gtk-refresh", 1),
+    "button-wifi-settings": ("WLAN Setting", 3),
+    "button-network-configure": ("Preferred Network", 5),
+    "button-active-device": ("Active WIFI", 7),
 }
 AUTOMATIC = {"hscrollbar-policy": "automatic", "vscrollbar-policy": "automatic"}
 

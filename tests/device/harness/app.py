@@ -142,11 +142,9 @@ class Pane:
 
     # Hands.
     def _button(self, what):
-        found = [one for one in self.tree().walk() if "GtkButton" in one["type"] or "label" in one
-                 and one["type"].endswith("Button")]
-        named = [one for one in found if one["name"] == what] or \
-                [one for one in found if one.get("label") == what]
-        return named[0] if named else None
+        buttons = [one for one in self.tree().walk() if one["type"].endswith("Button")]
+        return next((one for one in buttons if one["name"] == what),
+                    next((one for one in buttons if one.get("label") == what), None))
 
     def press(self, what, limit=LIMIT):
         """Clicks the button with this name or label ("gtk-ok" is a stock button's label) once it
@@ -154,14 +152,13 @@ class Pane:
         self.click(lambda: self._button(what), what, limit=limit)
 
     def click(self, what, description=None, button=1, count=1, limit=LIMIT):
-        """Clicks in the middle of a widget: its name, or a function that finds it."""
-        if isinstance(what, str):
-            name = what
-            found = lambda: next(iter(self.all(name)), None)
-        elif isinstance(what, dict):
-            found = lambda: next((one for one in self.tree().walk() if one["id"] == what["id"]), None)
-        else:
-            found = what
+        """Clicks in the middle of a widget: its name, its record, or a function that finds it."""
+        def found():
+            if callable(what):
+                return what()
+            key, value = ("name", what) if isinstance(what, str) else ("id", what["id"])
+            return next((one for one in self.tree().walk() if one[key] == value), None)
+
         last = []
 
         def ready():
@@ -198,16 +195,17 @@ class Pane:
             self.app.display.type(text)
 
     def choose(self, name, item):
-        """Chooses an item (its text or number) of a combo box, with the keys."""
+        """Chooses an item (its text or number) of a combo box in its menu."""
         combo = self.find(name)
         wanted = combo["items"].index(item) if isinstance(item, str) else item
         self.click(name)
-        menu = wait_until(lambda: next((one for one in self.app.windows() if one["visible"]
-                          and one["mapped"] and one.all(type="GtkMenu")
-                          or one["visible"] and one["mapped"] and one.all(type="GtkTreeMenu")), None),
-                          f"the menu of {name}")
-        entries = [one for one in menu.walk() if "MenuItem" in one["type"] and one["mapped"]]
-        x, y, width, height = entries[wanted]["rect"]
+
+        def items():
+            menus = [one for one in self.app.windows() if one["mapped"] and one.all(type="GtkMenu")]
+            return [one for menu in menus for one in menu.walk()
+                    if one["type"].endswith("MenuItem") and one["mapped"]]
+
+        x, y, width, height = wait_until(items, f"the menu of {name}")[wanted]["rect"]
         self.app.display.click(x + width // 2, y + height // 2)
         wait_until(lambda: self.find(name)["active"] == wanted, f"{name} to change")
 
@@ -221,24 +219,16 @@ class Pane:
 
     def _reach(self, name, row, column):
         """Turns the wheel until the row is in sight."""
-        def window_of(widget):
-            while widget is not None and widget["type"] != "GtkScrolledWindow":
-                widget = widget.parent
-            return widget
-
-        for _ in range(400):
-            widget = self.find(name)
-            frame = window_of(widget)
-            if frame is None:
-                return
+        frame = self.find(name)
+        while frame is not None and frame["type"] != "GtkScrolledWindow":
+            frame = frame.parent
+        while frame is not None:
             left, top, width, height = frame["rect"]
-            x, y, _, cell_height = self.cell(name, row, column)
+            _, y, _, cell_height = self.cell(name, row, column)
             if y >= top and y + cell_height <= top + height:
                 return
-            before = y
             self.app.display.click(left + width // 2, top + height // 2, 5 if y > top else 4)
-            wait_until(lambda: self.cell(name, row, column)[1] != before, f"{name} to scroll")
-        raise AssertionError(f"row {row} of {name} cannot be reached")
+            wait_until(lambda: self.cell(name, row, column)[1] != y, f"{name} to scroll to {row}")
 
 
 class App(Pane):

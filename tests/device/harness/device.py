@@ -82,7 +82,8 @@ class Device:
                  ": >/device/state/ready; exec sleep infinity"],
                 env={**os.environ, "SIMULATE_STATE": self.state}, stdin=subprocess.DEVNULL,
                 stdout=self._log, stderr=self._log)
-            wait_until(lambda: os.path.exists(f"{self.state}/ready") or self._simulate.poll() is not None,
+            wait_until(lambda: os.path.exists(f"{self.state}/ready") or
+                       self._simulate.poll() is not None,
                        lambda: self.state_file("simulate.log").decode(), 60)
             assert self._simulate.poll() is None, self.state_file("simulate.log").decode()
             self._init = _children(self._simulate.pid)[0]
@@ -150,7 +151,8 @@ class Device:
         return f"{self.state}/probe.{number}"
 
     def expect(self, pattern):
-        """Declares a warning, critical or sanitizer line that this test wants (regular expression)."""
+        """Declares a warning, critical or sanitizer line that this test wants (a regular
+        expression)."""
         self.expected.append(re.compile(pattern))
 
     def complaints(self):
@@ -331,14 +333,16 @@ def scan_text(*networks):
     lines = [b"wlan0     Scan completed :"]
     for number, network in enumerate(networks, 1):
         network = (network,) if isinstance(network, (str, bytes)) else network
-        standard = (None, "off", "70/100", "Master", f"02:00:00:00:{number // 256:02X}:{number % 256:02X}")
+        standard = (None, "off", "70/100", "Master",
+                    f"02:00:00:00:{number // 256:02X}:{number % 256:02X}")
         essid, key, quality, mode, mac = tuple(network) + standard[len(network):]
         lines += [
             b"          Cell %02d - Address: %s" % (number, _bytes(mac)),
             b'                    ESSID:"%s"' % _bytes(essid),
             b"                    Mode:" + _bytes(mode),
             b"                    Frequency:2.437 GHz (Channel 6)",
-            b"                    Quality:%s  Signal level:-50 dBm  Noise level:-95 dBm" % _bytes(quality),
+            b"                    Quality:%s  Signal level:-50 dBm  Noise level:-95 dBm"
+            % _bytes(quality),
             b"                    Encryption key:" + _bytes(key),
             b"                    Bit Rates:54 Mb/s",
         ]

@@ -29,7 +29,8 @@ class Display:
         self.name = ":" + number
         self._x = xdisplay.Display(self.name)
         self.root = self._x.screen().root
-        self.width, self.height = self._x.screen().width_in_pixels, self._x.screen().height_in_pixels
+        self.width = self._x.screen().width_in_pixels
+        self.height = self._x.screen().height_in_pixels
         self._listen()
         if window_manager:
             environment = {"PATH": os.environ["PATH"], "DISPLAY": self.name, "HOME": folder,
@@ -40,9 +41,10 @@ class Display:
                        "the window manager did not start")
 
     def _start(self, command, **more):
+        # Nothing stays behind when the tests are killed.
         self._processes.append(subprocess.Popen(
-            # Nothing stays behind when the tests are killed.
-            ["setpriv", "--pdeathsig", "KILL"] + command, stdin=subprocess.DEVNULL, stdout=self._log, stderr=self._log, **more))
+            ["setpriv", "--pdeathsig", "KILL"] + command, stdin=subprocess.DEVNULL,
+            stdout=self._log, stderr=self._log, **more))
 
     # What clients ask of the server, in the server's own order: nothing is missed, nothing is read
     # too late, as it would be by looking at a property after the news that it changed.

@@ -1,5 +1,7 @@
 // Looks at the real program's widgets from outside: a GTK+ module that answers questions on a
-// socket, from the program's own main loop (nested ones of dialogs too). It changes nothing.
+// socket, from the program's own main loop (nested ones of dialogs too). It changes nothing, and
+// answers only when the program has nothing more urgent to do: events handled, sizes settled, idle
+// jobs done, all drawn.
 //
 // One question a line, one JSON value a line back. Bytes of texts stand as U+0000 to U+00FF.
 //   tree             every top-level window with all that is in it
@@ -482,7 +484,8 @@ static gboolean cb_connection(GIOChannel *channel, GIOCondition condition, gpoin
     int fd = accept4(g_io_channel_unix_get_fd(channel), NULL, NULL, SOCK_CLOEXEC);
     if (fd >= 0) {
         GIOChannel *connection = g_io_channel_unix_new(fd);
-        g_io_add_watch(connection, G_IO_IN | G_IO_HUP, cb_question, g_string_new(NULL));
+        g_io_add_watch_full(connection, G_PRIORITY_LOW, G_IO_IN | G_IO_HUP, cb_question,
+                            g_string_new(NULL), NULL);
         g_io_channel_unref(connection);
     }
     return TRUE;
@@ -504,7 +507,7 @@ int gtk_module_init(gint *argc, char ***argv)
         return 0;
     }
     GIOChannel *channel = g_io_channel_unix_new(fd);
-    g_io_add_watch(channel, G_IO_IN, cb_connection, NULL);
+    g_io_add_watch_full(channel, G_PRIORITY_LOW, G_IO_IN, cb_connection, NULL, NULL);
     g_io_channel_unref(channel);
     return 0;
 }
