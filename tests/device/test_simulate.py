@@ -45,7 +45,8 @@ def test_an_ordinary_user_can_run_it():
 
 def test_a_device_begins_without_files_of_the_machine(device):
     d = device("street")
-    assert d.sh("find /tmp -maxdepth 1 ! -type d; cat /proc/kv/iwifi") == ""
+    with tempfile.NamedTemporaryFile(dir="/tmp") as late:
+        assert d.sh("find /tmp -maxdepth 1 ! -type d; cat /proc/kv/iwifi") == "", late.name
     assert d.file("/etc/wireless.conf") is None and d.file("/etc/build_in_wifi") is None
 
 

@@ -169,7 +169,9 @@ class Device:
 
     # The namespaces.
     def _inside(self, *command):
-        own_user = [] if os.getuid() == 0 else ["--user", "--preserve-credentials"]
+        own_user = ["--user", "--preserve-credentials"]
+        if os.readlink(f"/proc/{self._init}/ns/user") == os.readlink("/proc/self/ns/user"):
+            own_user = []
         return ["nsenter", "--target", str(self._init), *own_user, "--mount", "--net", "--pid",
                 "--root", "--wd", *command]
 

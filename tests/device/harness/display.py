@@ -5,9 +5,9 @@ import os
 import subprocess
 import threading
 
-from Xlib import X, XK, display as xdisplay
+from Xlib import X, XK, display as xdisplay, error
 from Xlib.ext import record, xtest
-from Xlib.protocol import rq
+from Xlib.protocol import event
 
 from .wait import wait_until
 
@@ -149,9 +149,7 @@ class Display:
 
     def close_window(self, title):
         """What a press on the title bar's close button asks of the window."""
-        window = self._window(self.root, title)
-        assert window is not None, f"no window {title!r}"
-        from Xlib.protocol import event
+        window = wait_until(lambda: self._window(self.root, title), f"a window {title!r}")
         message = event.ClientMessage(
             window=window, client_type=self._x.intern_atom("WM_PROTOCOLS"),
             data=(32, [self._x.intern_atom("WM_DELETE_WINDOW"), X.CurrentTime, 0, 0, 0]))
@@ -159,12 +157,16 @@ class Display:
         self._x.sync()
 
     def _window(self, window, title):
-        for child in window.query_tree().children:
-            if child.get_wm_name() == title and child.get_wm_state() is not None:
-                return child
-            found = self._window(child, title)
-            if found is not None:
-                return found
+        """The window with that title which the window manager has taken in."""
+        try:
+            for child in window.query_tree().children:
+                if child.get_wm_name() == title and child.get_wm_state() is not None:
+                    return child
+                found = self._window(child, title)
+                if found is not None:
+                    return found
+        except error.BadWindow:  # it went while we looked
+            pass
         return None
 
     def screenshot(self, path):
