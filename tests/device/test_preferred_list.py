@@ -265,12 +265,13 @@ def test_cancelled_edits_reach_nobody(device):
 
 
 def test_long_list_stays_in_sight(device):
-    networks = [Network(f"net {number}") for number in range(40)]
+    # One name is wider than the dialog, so that the list has its full width from the beginning.
+    networks = [Network(f"net {number}", "m" * 100 if number == 7 else "") for number in range(40)]
     _, app = start(device, *networks)
     dialog = open_list(app)
 
     def in_sight(row):
-        left, top, _, height = dialog.find(type="GtkScrolledWindow")["rect"]
+        _, top, _, height = dialog.find(type="GtkViewport")["rect"]
         _, y, _, cell_height = dialog.cell(FRONT, row)
         return top <= y and y + cell_height <= top + height
 
