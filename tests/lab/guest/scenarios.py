@@ -180,6 +180,23 @@ def wpa2_with_a_blank_in_its_name():
     w.photograph("wpa2")
 
 
+def its_key_is_for_root_alone():
+    for pid in filter(str.isdigit, os.listdir("/proc")):
+        try:
+            with open(f"/proc/{pid}/cmdline", "rb") as file:
+                check(b"correct horse" not in file.read(), f"process {pid} was given the key")
+        except FileNotFoundError:
+            pass
+    for top in ("/etc", "/run", "/tmp", "/var"):
+        found = run("grep", "-rlsI", "correct horse", top, check=False).split()
+        for path in found:
+            if path.startswith(("/tmp/hostapd", "/tmp/screen")):
+                continue
+            hidden = os.stat(path).st_mode & 0o077 == 0
+            check(hidden, f"{path}, which holds the key, has mode {os.stat(path).st_mode:o}")
+            check(not path.startswith("/var/log"), f"{path} holds the key")
+
+
 def a_remembered_network_by_double_click():
     w.select_surely(wanted_row("Home Net"))
     press_button("gtk-disconnect")
@@ -536,6 +553,7 @@ GROUPS = {
         a_refresh_finds_the_connected_network_again,
         disconnect_leaves_the_network,
         wpa2_with_a_blank_in_its_name,
+        its_key_is_for_root_alone,
         a_remembered_network_by_double_click,
         from_one_network_straight_to_another,
         wep_with_the_first_key,
