@@ -16,6 +16,17 @@ def address_polls(printed):
     return printed.count("WIRELESS-LAN-DEBUG: detect_network_interface_state ...\n")
 
 
+def poll_until(d, app, line, start=0):
+    """Lets 2 s pass again and again until the line is printed behind `start`. Returns what was
+    printed before it, and the place behind it."""
+    for _ in range(60):
+        before, found, _ = app.stderr()[start:].partition(line)
+        if found:
+            return before, start + len(before) + len(line)
+        pass_time(d, app, 2000)
+    raise AssertionError(f"no {line!r} in two minutes\n{app.stderr()[start:]}")
+
+
 def assert_locked(app, locked=True):
     for name in LOCKED:
         assert app.sensitive(name) is not locked, name
@@ -154,17 +165,12 @@ def test_two_chains_share_their_counts(device):
     connect(app, 1)
     wait_commands(d, app)
     poll_link(d, app)
-    polled = app.stderr()
-    while "acquire address failed." not in polled:
-        pass_time(d, app, 2000)
-        polled = app.stderr()
-    first, _, second = polled.partition("WIRELESS-LAN-DEBUG: acquire address failed.\n")
-    assert address_polls(first) == 21
+    failed = "WIRELESS-LAN-DEBUG: acquire address failed.\n"
+    before, place = poll_until(d, app, failed)
+    assert address_polls(before) == 21
     # The other chain goes on alone, from nothing.
-    while "acquire address failed." not in second:
-        pass_time(d, app, 2000)
-        second = app.stderr()[len(first) + 1:].partition("acquire address failed.\n")[2]
-    assert address_polls(second.partition("WIRELESS-LAN-DEBUG: acquire address failed.")[0]) == 21
+    before, _ = poll_until(d, app, failed, place)
+    assert address_polls(before) == 21
 
     # Two link pollers: the address of the first chain gives the buttons back too early.
     confirm_settings(app)
@@ -178,14 +184,11 @@ def test_two_chains_share_their_counts(device):
     assert_locked(app, False)
     connect(app, 2)
     wait_commands(d, app, 3)
-    while "Not connect,return." not in app.stderr()[start:]:
-        pass_time(d, app, 2000)
-    first, _, second = app.stderr()[start:].partition("WIRELESS-LAN-DEBUG: Not connect,return.\n")
-    assert link_polls(first) == 21
-    while "Not connect,return." not in second:
-        pass_time(d, app, 2000)
-        second = app.stderr()[start + len(first) + 1:].partition("Not connect,return.\n")[2]
-    assert link_polls(second.partition("WIRELESS-LAN-DEBUG: Not connect,return.")[0]) == 21
+    failed = "WIRELESS-LAN-DEBUG: Not connect,return.\n"
+    before, place = poll_until(d, app, failed, start)
+    assert link_polls(before) == 21
+    before, _ = poll_until(d, app, failed, place)
+    assert link_polls(before) == 21
     assert settle(app) == IDLE
     pass_time(d, app, 60000)
     assert app.stderr().count("Not connect,return.") == 2
