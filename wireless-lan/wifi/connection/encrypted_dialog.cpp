@@ -8,9 +8,6 @@
 #include "base/widgets.h"
 #include "preferred/store.h"
 
-static const char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
-static const char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
-static const char ENTRY_KEY[] = "connect_key";
 static const guint PADDING = 5;
 
 gchar *sel_key = nullptr;

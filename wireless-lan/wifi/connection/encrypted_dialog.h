@@ -5,13 +5,17 @@
 
 #include <gtk/gtk.h>
 
+// Keys of the dialog's controls while it is open.
+constexpr char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
+constexpr char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
+constexpr char ENTRY_KEY[] = "connect_key";
+
 // Key of the preferred network that was filled in, NULL: none. Written here, flow frees it.
 extern gchar *sel_key;
 
 // Builds the dialog for the network at connect_index; `match_count` gets the number of preferred
-// networks of its name and stays as it is when the preferred lists are missing. While it is open
-// its controls are registered as "Authentication_ComboBox", "Key_Index_ComboBox" and "connect_key".
-// The caller runs and destroys it.
+// networks of its name and stays as it is when the preferred lists are missing. The caller runs and
+// destroys it.
 GtkWidget *build_encrypted_dialog(int *match_count);
 
 // The key in the dialog, NULL without a dialog. An untouched stored key comes back byte for byte,

@@ -65,8 +65,8 @@ static void read_answers(WIFI_CELL *chosen)
 {
     g_autofree gchar *key = entered_key();
 
-    read_active("Authentication_ComboBox", &chosen->key_mgmt, "key_mgmt");
-    read_active("Key_Index_ComboBox", &chosen->key_index, "do connect key_index");
+    read_active(AUTHENTICATION_KEY, &chosen->key_mgmt, "key_mgmt");
+    read_active(KEY_INDEX_KEY, &chosen->key_index, "do connect key_index");
     if (key != nullptr)
         copy_field(chosen->userkey, sizeof chosen->userkey, key);
     chosen->encmode = ENC_OPEN;
