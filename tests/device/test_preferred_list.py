@@ -240,6 +240,21 @@ def test_delete(device):
     assert app.quit() == 0
 
 
+def test_long_name_in_the_question(device):
+    """A name of one long word breaks anywhere, so that the buttons stay on the screen."""
+    name = "w" * 120
+    d, app = start(device, Network(name))
+    dialog = open_list(app)
+    select(dialog, 0)
+    dialog.press("preferred_button_delete")
+    question = app.dialog(DELETE)
+    assert question.find(text=f"Do you want to detele the network\n{name}?")
+    left, _, width, _ = question.tree()["rect"]
+    assert left >= 0 and left + width <= d.display.width
+    close(question, "gtk-ok")
+    assert names(app) == []
+
+
 def test_cancelled_edits_reach_nobody(device):
     """All is deleted and cancelled; then a network joins the list from the main window."""
     d, app = start(device, HOME, CAFE)

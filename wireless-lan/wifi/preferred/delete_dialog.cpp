@@ -29,6 +29,8 @@ static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
     gtk_label_set_markup(GTK_LABEL(label), markup);
     gtk_label_set_justify(GTK_LABEL(label), GTK_JUSTIFY_CENTER);
     gtk_label_set_line_wrap(GTK_LABEL(label), TRUE);
+    // A long name without a blank must not push the buttons off the screen.
+    gtk_label_set_line_wrap_mode(GTK_LABEL(label), PANGO_WRAP_WORD_CHAR);
     gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
 
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
