@@ -159,21 +159,27 @@ class Pane:
             key, value = ("name", what) if isinstance(what, str) else ("id", what["id"])
             return next((one for one in self.tree().walk() if one[key] == value), None)
 
-        last = []
-
-        def ready():
-            # In its place, on the screen, and not about to be moved by the window manager.
-            widget = found()
-            usable = widget and widget["mapped"] and widget["usable"] and widget["rect"][2] > 1
-            steady = usable and last == [widget["rect"]] and self.tree().get("active", True)
-            last[:] = [widget["rect"]] if usable else []
-            return widget if steady else None
-
-        widget = wait_until(ready, lambda: f"{description or what} to press in\n{self.app.sketch()}",
-                            limit)
+        widget = self._in_place(found, lambda widget: widget["rect"],
+                                f"{description or what} to press", limit)
         x, y, width, height = widget["rect"]
         self.app.display.click(x + width // 2, y + height // 2, button, count)
         return widget
+
+    def _in_place(self, find, place, what, limit=LIMIT):
+        """The widget, once it can be used, its window is in front, and its place is the same twice
+        running: not about to be moved by the window manager."""
+        last = []
+
+        def ready():
+            widget = find()
+            usable = widget and widget["mapped"] and widget["usable"] and widget["rect"][2] > 1 \
+                and self.tree().get("active", True)
+            now = [place(widget)] if usable else []
+            steady = usable and last == now
+            last[:] = now
+            return widget if steady else None
+
+        return wait_until(ready, lambda: f"{what} in\n{self.app.sketch()}", limit)
 
     def type(self, name, text, replace=True):
         """Types into an entry, with a click into it when the focus is elsewhere; `replace` takes
@@ -213,6 +219,8 @@ class Pane:
         return self.app.ask(f"cell {self.find(name)['id']} {row} {column}")
 
     def click_row(self, name, row, button=1, count=1, column=0):
+        """Clicks into a row of a list, near the left of the column."""
+        self._in_place(lambda: self.find(name), lambda widget: self.cell(name, row, column), name)
         self._reach(name, row, column)
         x, y, width, height = self.cell(name, row, column)
         self.app.display.click(x + min(width, 40) // 2, y + height // 2, button, count)
