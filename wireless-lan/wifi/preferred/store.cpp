@@ -35,7 +35,7 @@ static gchar *shown_name(const gchar *alias, const gchar *essid)
     return displayable(alias[0] != '\0' ? alias : essid);
 }
 
-// The list asks for another size only where a scrolled window drives it directly; in a viewport new
+// In a viewport the list does not ask for more room by itself once it has its full width, and new
 // rows would stay out of reach.
 static void front_changed_size()
 {
@@ -105,8 +105,8 @@ static gboolean restore_highlight(gpointer)
 }
 
 // A click on the selected row takes its highlight away, yet the buttons still act on that row. The
-// list tells of it in the middle of the change, so the highlight comes back right after it, before
-// anything is drawn.
+// list tells of it in the middle of the change, which may also be one to another row, so what is
+// missing comes back right after it.
 static void cb_unselect_row(GtkWidget *, gint, gint, GdkEventButton *, gpointer)
 {
     g_idle_add_full(G_PRIORITY_HIGH_IDLE, restore_highlight, nullptr, nullptr);
