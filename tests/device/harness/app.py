@@ -340,6 +340,9 @@ class App(Pane):
 
     # Keys go where the focus is.
     def key(self, combination):
+        if self.device.window_manager:
+            wait_until(lambda: any(one["active"] for one in self.windows() if "active" in one),
+                       lambda: f"a window for {combination}\n{self.sketch()}")
         self.display.key(combination)
 
     # What it prints, and its end.
