@@ -49,8 +49,10 @@ def scan_again(d, app, milliseconds=CHECK_MS):
 
 def test_a_refresh_while_the_key_is_typed(device):
     d, app = activated(device, "cafe", ("home net", "on"), ("neighbour", "on"), select=1,
-                       files=preferred(("", "home net", 1, 0, "home-key"),
-                                       ("", "neighbour", 1, 0, "their-key")))
+                       files=preferred(("", "neighbour", 1, 0, "their-key"),
+                                       ("", "home net", 1, 0, "home-key"),
+                                       ("", "neighbour", 1, 0, "their-other-key"),
+                                       ("", "home net", 1, 0, "home-key-2")))
     app.press("button-connect")
     dialog = app.dialog("Encrypted Network")
     # Another order: where "home net" was stands "neighbour" now, and the device is with it.
@@ -61,10 +63,12 @@ def test_a_refresh_while_the_key_is_typed(device):
     assert [row[0] for row in app.networks()] == ["cafe", "neighbour", "new", "home net"]
     # The dialog still speaks of the network that it was opened for.
     assert dialog.text("connect_key") == "home-key"
+    dialog.choose("GtkComboBox", 1)
+    assert dialog.text("connect_key") == "home-key-2"
     dialog.press("gtk-ok")
     wait_commands(d, app)
     assert d.commands("iwset")[0].argv == [
-        "/sbin/iwset", "wpa", "wlan0", "essid", "home net", "mode", "Managed", "key", "home-key",
+        "/sbin/iwset", "wpa", "wlan0", "essid", "home net", "mode", "Managed", "key", "home-key-2",
         "enc", "open"]
     assert [row[4] for row in app.networks()] == ["Disconnect", "Disconnect", "Disconnect",
                                                   CONNECTING]
