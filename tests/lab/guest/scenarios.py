@@ -321,11 +321,18 @@ def an_access_point_that_goes_away():
     check(w.alive(), "the program ended")
 
 
-def an_access_point_that_is_gone_before_the_press():
+def an_access_point_that_comes_back():
+    # The supplicant goes on looking for its network; a refresh finds it joined again.
     trouble.goer = air.access_point(2, 6, [network(b"Goer", net=3)])
-    row = wanted_row("Goer")
-    trouble.goer.terminate()
-    trouble.goer.wait()
+    w.refresh_until(lambda now: any(one[0] == "Goer" and one[4].startswith("Connected\n")
+                                    for one in now), "it is joined again")
+
+
+def an_access_point_that_is_gone_before_the_press():
+    passer = air.access_point(3, 11, [network(b"Passer", net=4)])
+    row = wanted_row("Passer")
+    passer.terminate()
+    passer.wait()
     w.select_surely(row)
     w.notices()
     press_button("gtk-connect")
@@ -568,6 +575,7 @@ GROUPS = {
         the_right_key_after_it,
         without_addresses_the_address_is_invalid,
         an_access_point_that_goes_away,
+        an_access_point_that_comes_back,
         an_access_point_that_is_gone_before_the_press,
     ],
     settings: [
