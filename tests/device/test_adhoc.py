@@ -1,7 +1,7 @@
 """The dialog with the network that the device hosts."""
 
 import pytest
-from Xlib import display as xdisplay
+from Xlib import X, display as xdisplay
 
 from harness.wait import wait_until
 from settings_page import CONF, GROUP_TITLE, Settings, close_dialogs, dhcp
@@ -57,14 +57,18 @@ def stored(settings):
 
 
 def stacking(app):
-    """Titles from the lowest to the highest window, as the window manager stacks them."""
+    """(title, whether it is kept above the others) from the lowest to the highest window."""
     connection = xdisplay.Display(app.display.name)
+    above = connection.intern_atom("_NET_WM_STATE_ABOVE")
+
+    def property_of(window, name):
+        found = window.get_full_property(connection.intern_atom(name), X.AnyPropertyType)
+        return list(found.value) if found else []
+
     try:
-        root = connection.screen().root
-        windows = root.get_full_property(
-            connection.intern_atom("_NET_CLIENT_LIST_STACKING"), 0).value
-        return [connection.create_resource_object("window", one).get_wm_name()
-                for one in windows]
+        windows = [connection.create_resource_object("window", one) for one in
+                   property_of(connection.screen().root, "_NET_CLIENT_LIST_STACKING")]
+        return [(one.get_wm_name(), above in property_of(one, "_NET_WM_STATE")) for one in windows]
     finally:
         connection.close()
 
@@ -117,12 +121,13 @@ def test_window(app):
 
 def test_stands_above_the_settings(app):
     settings, information = hosted(app, essid="board")
-    assert stacking(app)[-2:] == ["WLAN Setting", GROUP_TITLE]
-    # A click on the dialog below neither raises nor uses it.
-    left, top, width, _ = settings.pane.tree()["rect"]
-    app.display.click(left + width // 2, top + 5)
+    wait_until(lambda: stacking(app)[-2:] == [("WLAN Setting", False), (GROUP_TITLE, True)],
+               lambda: f"the order {stacking(app)}")
+    # The dialog below is seen and not used.
+    x, y, width, height = settings.widget("static")["rect"]
+    app.display.click(x + width // 2, y + height // 2)
     information.type(ENTRY, "still here")
-    assert stacking(app)[-1] == GROUP_TITLE
+    assert settings.active("static") == [False]
     information.press("gtk-cancel")
     information.wait_gone()
     settings.cancel()

@@ -1,10 +1,12 @@
-// The settings dialog from inside the program: what no hand at the device can bring about.
+// The dialogs of the settings from inside the program: what no hand at the device can bring about
+// or see.
 
 #include <gtest/gtest.h>
 #include <gtk/gtk.h>
 
 #include "base/state.h"
 #include "base/widgets.h"
+#include "settings/adhoc_dialog.h"
 #include "settings/wlan_dialog.h"
 
 static void (*under_dialog)(GtkDialog *);
@@ -86,6 +88,17 @@ static const char *entry_text(const char *key)
     return gtk_entry_get_text(GTK_ENTRY(widget(key)));
 }
 
+static guint born;
+static guint alive;
+
+// Counts `object` until it is finalized, which destroying it is not.
+static void count(gpointer object)
+{
+    born++;
+    alive++;
+    g_object_set_data_full(G_OBJECT(object), "counted", object, [](gpointer) { alive--; });
+}
+
 static void expect_flags(int index, gboolean isdhcp, gboolean isstatic)
 {
     EXPECT_EQ(my_wifi->wifi_interface[index]->isdhcp, isdhcp) << index;
@@ -160,7 +173,6 @@ TEST(SettingsDialog, RegistryHoldsTheRadiosAndLetsThemGo)
     static const char *const keys[] = {"dhcpnone0",     "staticnone0",    "addressnone0",
                                        "netmasknone0",  "broadcastnone0", "gatewaynone0",
                                        "auto_dnsnone0", "adhoc-hostnone0"};
-    static gpointer widgets[G_N_ELEMENTS(keys)];
 
     start();
     run_dialog([](GtkDialog *) {
@@ -173,15 +185,12 @@ TEST(SettingsDialog, RegistryHoldsTheRadiosAndLetsThemGo)
         }
     });
     run_dialog([](GtkDialog *) {
-        for (gsize i = 0; i < G_N_ELEMENTS(keys); i++) {
-            widgets[i] = widget(keys[i]);
-            g_object_add_weak_pointer(G_OBJECT(widgets[i]), &widgets[i]);
-        }
+        for (const char *key : keys)
+            count(widget(key));
     });
-    for (gsize i = 0; i < G_N_ELEMENTS(keys); i++) {
-        EXPECT_EQ(widgets[i], nullptr) << keys[i];
-        EXPECT_EQ(find_widget(keys[i]), nullptr) << keys[i];
-    }
+    EXPECT_EQ(alive, 0U);
+    for (const char *key : keys)
+        EXPECT_EQ(find_widget(key), nullptr) << key;
 }
 
 TEST(SettingsDialog, GoesWithTheMainWindow)
@@ -217,4 +226,97 @@ TEST(SettingsDialog, GoesWithTheMainWindowUnderARefusal)
     cb_wifi_settings(nullptr, nullptr);
     EXPECT_EQ(mainwindow, nullptr);
     EXPECT_EQ(open_dialog(), nullptr);
+}
+
+// The answer OK for a group that is shown as it is.
+static void accept_group(WIFI_CELL *group)
+{
+    g_idle_add(
+        [](gpointer) -> gboolean {
+            gtk_dialog_response(open_dialog(), GTK_RESPONSE_OK);
+            return FALSE;
+        },
+        nullptr);
+    cb_adhoc_setup(nullptr, group);
+    EXPECT_EQ(open_dialog(), nullptr);
+}
+
+TEST(GroupDialog, Stores)
+{
+    static const struct {
+        guint32 encmode;
+        guint32 stored;
+    } rows[] = {{ENC_OFF, ENC_OFF},
+                {ENC_OPEN, ENC_OPEN},
+                {ENC_RESTRICTED, ENC_RESTRICTED},
+                {3, ENC_OFF}, // no radio button stands for it, so the first one is on
+                {G_MAXUINT32, ENC_OFF}};
+
+    start();
+    for (const auto &row : rows) {
+        WIFI_CELL group = {};
+
+        copy_field(group.essid, sizeof group.essid, "board \xff");
+        copy_field(group.userkey, sizeof group.userkey, "key \xfe");
+        copy_field(group.mode, sizeof group.mode, "Ad-Hos"); // as the file's reader leaves it
+        group.encmode = static_cast<t_encmode>(row.encmode);
+        accept_group(&group);
+        EXPECT_STREQ(group.essid, "board \xff");
+        EXPECT_STREQ(group.userkey, "key \xfe");
+        EXPECT_STREQ(group.mode, "Ad-Hoc");
+        EXPECT_EQ(group.encmode, row.stored);
+    }
+}
+
+static gboolean cb_count(GSignalInvocationHint *, guint, const GValue *values, gpointer)
+{
+    GObject *object = static_cast<GObject *>(g_value_get_object(values));
+
+    if ((GTK_IS_RADIO_BUTTON(object) || GTK_IS_ENTRY(object)) &&
+        g_object_get_data(object, "counted") == nullptr)
+        count(object);
+    return TRUE;
+}
+
+// Nobody owns the key entry and the radio buttons but the dialog's handler.
+TEST(GroupDialog, LeavesNoWidgetBehind)
+{
+    WIFI_CELL group = {};
+
+    start();
+    copy_field(group.essid, sizeof group.essid, "board");
+    copy_field(group.userkey, sizeof group.userkey, "secret");
+    accept_group(&group); // the signals exist from here on
+    born = 0;
+
+    const guint packed = g_signal_lookup("parent-set", GTK_TYPE_WIDGET);
+    const guint filled = g_signal_lookup("changed", GTK_TYPE_EDITABLE);
+    const gulong packed_hook = g_signal_add_emission_hook(packed, 0, cb_count, nullptr, nullptr);
+    const gulong filled_hook = g_signal_add_emission_hook(filled, 0, cb_count, nullptr, nullptr);
+
+    accept_group(&group);
+    g_signal_remove_emission_hook(packed, packed_hook);
+    g_signal_remove_emission_hook(filled, filled_hook);
+    EXPECT_EQ(born, 5U); // two entries, three radio buttons
+    EXPECT_EQ(alive, 0U);
+}
+
+TEST(GroupDialog, OffSwitchesTheKeyEntry)
+{
+    start();
+
+    GtkWidget *entry = GTK_WIDGET(g_object_ref_sink(gtk_entry_new()));
+    GtkWidget *toggle = GTK_WIDGET(g_object_ref_sink(gtk_toggle_button_new()));
+
+    for (const gboolean active : {1, 0, 1}) {
+        gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(toggle), active);
+        active_key_entry(GTK_TOGGLE_BUTTON(toggle), entry);
+        EXPECT_EQ(gtk_widget_get_sensitive(entry), !active);
+        cb_active_wifi_group(GTK_TOGGLE_BUTTON(toggle), entry);
+        EXPECT_EQ(gtk_widget_get_sensitive(entry), active);
+    }
+    for (GtkWidget *used : {entry, toggle}) {
+        gtk_widget_destroy(used);
+        g_object_unref(used);
+    }
 }
