@@ -395,6 +395,7 @@ MEASUREMENTS = {
 
 
 def print_table():
+    rows.sort(key=lambda row: not row[2] and row[3] != "?")  # what has a limit comes first
     headings = ("what", "measured", "limit", "within")
     widths = [max(len(row[i]) for row in [headings, *rows]) for i in range(4)]
     for row in [headings, tuple("-" * width for width in widths), *rows]:
