@@ -396,7 +396,10 @@ class App(Pane):
         return self._process.returncode
 
     def quit(self, limit=60):
-        """Closes the main window as its title bar does; gives the exit status."""
+        """Closes the main window as its title bar does, once the last dialog has gone (the window
+        takes no notice before); gives the exit status."""
+        wait_until(lambda: not any(one["visible"] and one["type"].endswith("Dialog")
+                                   for one in self.windows()), "the dialogs to go", limit)
         title = self.tree()["title"]
         self._disconnect()
         self.display.close_window(title)
