@@ -3,13 +3,9 @@
 import os
 import stat
 
-import pytest
-
-from connecting import (ACQUIRING, CONNECTING, HIDDEN, IDLE, INVALID, LOCKED, OFFER, address_of,
-                        answer_key, arrive, children, connect, connected, idle, poll_address,
-                        pass_time, poll_link, preferred, refresh, settle,
-                        type_answer, wait_commands)
-from harness import wait_until
+from connecting import (ACQUIRING, CONNECTING, HIDDEN, IDLE, LOCKED, address_of, answer_key, arrive,
+                        children, connect, connected, idle, pass_time, poll_address, poll_link,
+                        preferred, refresh, settle, type_answer, wait_commands)
 
 PRINTABLE = "".join(map(chr, range(0x21, 0x7F)))
 
@@ -372,7 +368,7 @@ def test_a_cancelled_key_leaves_no_trace(device):
     assert dialog.text("connect_key") == ""
 
 
-def test_a_thousand_polls_leave_the_same_descriptors(device):
+def test_connects_leave_no_descriptors_and_no_children(device):
     d, app = idle(device, "one", "two")
     counts = []
     for row in (0, 1, 0):

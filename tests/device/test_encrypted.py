@@ -4,8 +4,8 @@ import re
 
 import pytest
 
-from connecting import (OFFER, answer_key, arrive, connect, idle, preferred,
-                        settle, type_answer, wait_commands)
+from connecting import (OFFER, answer_key, arrive, connect, idle, preferred, type_answer,
+                        wait_commands)
 from harness import wait_until
 
 FILE = "/etc/wireless-user.conf"

@@ -2,7 +2,7 @@
 
 import subprocess
 
-from connecting import (ACQUIRING, CONNECTING, IDLE, INVALID, LOCKED, address_of, arrive, connect,
+from connecting import (ACQUIRING, CONNECTING, IDLE, INVALID, LOCKED, address_of, connect,
                         connected, idle, pass_time, poll_address, poll_link, settle, wait_commands)
 
 ZEROS = "00:00:00:00:00:00"
