@@ -190,6 +190,10 @@ gchar *get_essid_value(gchar *src, const gchar *target, int unit);
 // former records stay. For a name that is not usable nothing is run and no network is left.
 void get_cell(WIFI_INTERFACE *iface);
 
+// The word for an encryption in /etc/wireless.conf and for /sbin/iwset: "off", "open" or (any other
+// value) "restricted".
+const char *encryption_word(t_encmode encmode);
+
 // --- /etc/wireless.conf -----------------------------------------------------------------------
 
 // Writes the settings of wifi_interface[0] and the static_ globals. FALSE when they could not be

@@ -18,11 +18,17 @@ static const struct {
     {"gateway", static_gateway},
 };
 
-static const char *encryption_word(t_encmode encmode)
+const char *encryption_word(t_encmode encmode)
 {
-    if (encmode == ENC_OFF)
+    switch (encmode) {
+    case ENC_OFF:
         return "off";
-    return encmode == ENC_OPEN ? "open" : "restricted";
+    case ENC_OPEN:
+        return "open";
+    case ENC_RESTRICTED:
+        break;
+    }
+    return "restricted";
 }
 
 static GString *basic_setting_text(const WIFI_INTERFACE *iface)

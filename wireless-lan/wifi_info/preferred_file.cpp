@@ -7,7 +7,8 @@
 
 constexpr int LINE_SIZE = 255;
 
-static const char *encryption_word(t_encmode encmode)
+// Any other number is "off" here, while /etc/wireless.conf takes it for "restricted".
+static const char *stored_encryption_word(t_encmode encmode)
 {
     if (encmode == ENC_RESTRICTED)
         return "restricted";
@@ -25,7 +26,7 @@ gboolean save_preferred_network_to_file(const gchar *file)
         append_line(text, "MODE", cell->mode);
         append_number_line(text, "KMGMT", static_cast<int>(cell->key_mgmt));
         append_number_line(text, "KINDEX", static_cast<int>(cell->key_index));
-        append_line(text, "Encryption", encryption_word(cell->encmode));
+        append_line(text, "Encryption", stored_encryption_word(cell->encmode));
         append_line(text, "KEY", cell->encmode == ENC_OFF ? "off" : cell->userkey);
     }
     g_autoptr(GError) error = nullptr;

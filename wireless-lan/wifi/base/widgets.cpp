@@ -106,6 +106,26 @@ GtkWidget *create_normal_ComboBox()
     return combo;
 }
 
+void set_active_number(GtkWidget *combo, const char *number)
+{
+    const gint64 item = g_ascii_strtoll(number, nullptr, 10);
+    const int items =
+        gtk_tree_model_iter_n_children(gtk_combo_box_get_model(GTK_COMBO_BOX(combo)), nullptr);
+
+    gtk_combo_box_set_active(GTK_COMBO_BOX(combo),
+                             item >= 0 && item < items ? static_cast<gint>(item) : 0);
+}
+
+GtkWidget *create_titled_frame(const gchar *title, guint border)
+{
+    GtkWidget *frame = gtk_frame_new(title);
+
+    gtk_frame_set_label_align(GTK_FRAME(frame), 0.0F, 0.6F);
+    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
+    gtk_container_set_border_width(GTK_CONTAINER(frame), border);
+    return frame;
+}
+
 gchar *displayable(const char *text)
 {
     return g_utf8_make_valid(text, -1);

@@ -46,6 +46,13 @@ void end_dialog(GtkWidget *dialog);
 // A combo of the texts "1" to "4" with the first one active.
 GtkWidget *create_normal_ComboBox();
 
+// Makes the item of a combo active that the decimal `number` names, counted from 0; one that is not
+// there gives the first.
+void set_active_number(GtkWidget *combo, const char *number);
+
+// The frame of a dialog: etched out, its title a little below the line, `border` pixels around it.
+GtkWidget *create_titled_frame(const gchar *title, guint border);
+
 // `text` as valid UTF-8 for what GTK draws: the bytes that are none become U+FFFD. g_free it.
 gchar *displayable(const char *text);
 

@@ -20,19 +20,6 @@
 static const char ESSID_FILE[] = "/tmp/essid_tmp";
 static const char KEY_FILE[] = "/tmp/key_tmp";
 
-const char *encryption_word(t_encmode encmode)
-{
-    switch (encmode) {
-    case ENC_OFF:
-        return "off";
-    case ENC_OPEN:
-        return "open";
-    case ENC_RESTRICTED:
-        break;
-    }
-    return "restricted";
-}
-
 const char *client_mode(const char *mode)
 {
     return g_ascii_strcasecmp(mode, "Master") == 0 ? "Managed" : mode;

@@ -13,10 +13,6 @@ gchar *iwset_command(const char *name, const WIFI_CELL *cell);
 // The key that the device is told for `cell`: "off" where it has none. The cell owns it.
 const char *key_word(const WIFI_CELL *cell);
 
-// The word that /sbin/iwset takes for an encryption: "off", "open" or (any other value)
-// "restricted".
-const char *encryption_word(t_encmode encmode);
-
 // The mode that /sbin/iwset and the preferred networks take: "Managed" for "Master" in any case,
 // else `mode` itself.
 const char *client_mode(const char *mode);

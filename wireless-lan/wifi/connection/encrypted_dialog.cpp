@@ -56,17 +56,6 @@ static GtkWidget *text_combo(std::initializer_list<const char *> items)
     return combo;
 }
 
-// Makes the item active that the decimal `number` names; one that is not there gives the first.
-static void set_active_number(GtkWidget *combo, const char *number)
-{
-    const gint64 item = g_ascii_strtoll(number, nullptr, 10);
-    const int items =
-        gtk_tree_model_iter_n_children(gtk_combo_box_get_model(GTK_COMBO_BOX(combo)), nullptr);
-
-    gtk_combo_box_set_active(GTK_COMBO_BOX(combo),
-                             item >= 0 && item < items ? static_cast<gint>(item) : 0);
-}
-
 GtkWidget *create_Authentication_ComboBox()
 {
     GtkWidget *backend = backend_list();

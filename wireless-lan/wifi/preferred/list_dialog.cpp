@@ -130,7 +130,7 @@ static GtkWidget *build_list_dialog()
                                                     GTK_RESPONSE_OK, nullptr);
     GtkWidget *cancel =
         gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
-    GtkWidget *frame = gtk_frame_new(_("Preferred Network Setting"));
+    GtkWidget *frame = create_titled_frame(_("Preferred Network Setting"), 5);
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
     GtkWidget *label = gtk_label_new(
         _("Automatic connect to one of the network \nfollowing the order in the list below"));
@@ -141,9 +141,6 @@ static GtkWidget *build_list_dialog()
     gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_window_set_default_size(GTK_WINDOW(dialog), 480, 320);
 
-    gtk_frame_set_label_align(GTK_FRAME(frame), 0.0F, 0.6F);
-    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
-    gtk_container_set_border_width(GTK_CONTAINER(frame), 5);
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
     gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), frame, TRUE, TRUE,

@@ -137,7 +137,7 @@ GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent)
     GtkWidget *dialog = gtk_dialog_new_with_buttons(
         _(form.title), GTK_WINDOW(parent), GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
         GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
-    GtkWidget *frame = gtk_frame_new(_("WiFi Network"));
+    GtkWidget *frame = create_titled_frame(_("WiFi Network"), 10);
     GtkWidget *table = gtk_table_new(8, 2, FALSE);
 
     gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
@@ -145,9 +145,6 @@ GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent)
     gtk_widget_set_can_default(dialog, TRUE);
     gtk_widget_grab_default(dialog);
 
-    gtk_frame_set_label_align(GTK_FRAME(frame), 0.0F, 0.6F);
-    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
-    gtk_container_set_border_width(GTK_CONTAINER(frame), 10);
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
     gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), frame, TRUE, TRUE,

@@ -20,17 +20,6 @@ static void choose_enc(const gchar *word)
         choose_form_radio(form.enc_restricted);
 }
 
-static void choose_key_index(const gchar *text)
-{
-    GtkComboBox *combo = GTK_COMBO_BOX(find_widget(form.key_index));
-    const gint64 index = g_ascii_strtoll(text, nullptr, 10);
-
-    printf("KEY_INDEX = %s \n", text);
-    if (index >= 0 &&
-        index < gtk_tree_model_iter_n_children(gtk_combo_box_get_model(combo), nullptr))
-        gtk_combo_box_set_active(combo, static_cast<gint>(index));
-}
-
 static void fill_form(gint row)
 {
     const gchar *enc = user_cell_text(row, LIST_ENC);
@@ -42,7 +31,8 @@ static void fill_form(gint row)
     choose_enc(enc);
     set_widget_sensitive(form.key_hbox, strcmp(enc, "ENC_OFF") != 0);
     set_form_text(form.key, user_cell_text(row, LIST_KEY));
-    choose_key_index(user_cell_text(row, LIST_KEY_INDEX));
+    printf("KEY_INDEX = %s \n", user_cell_text(row, LIST_KEY_INDEX));
+    set_active_number(find_widget(form.key_index), user_cell_text(row, LIST_KEY_INDEX));
 }
 
 // Toggling follows; a choice that stands already is not signalled, hence the direct calls.

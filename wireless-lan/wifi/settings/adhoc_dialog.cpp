@@ -105,15 +105,12 @@ static void build_unplaced(group_form *form, const WIFI_CELL *group_info)
 
 static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
 {
-    GtkWidget *frame = gtk_frame_new(_("Ad-Hoc Information"));
+    GtkWidget *frame = create_titled_frame(_("Ad-Hoc Information"), 10);
     GtkWidget *table = gtk_table_new(8, 2, FALSE);
     GtkWidget *label = gtk_label_new(_("ESSID"));
     const GtkAttachOptions fill = GTK_FILL;
     const GtkAttachOptions expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
 
-    gtk_frame_set_label_align(GTK_FRAME(frame), 0, 0.6F);
-    gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
-    gtk_container_set_border_width(GTK_CONTAINER(frame), 10);
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
 
