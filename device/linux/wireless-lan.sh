@@ -95,18 +95,6 @@ take_over() {
             ;;
         esac
     fi
-    # This one knows only all wireless interfaces or none, and blocks the radios that it leaves.
-    if connmanctl technologies 2>/dev/null |
-        awk '/^\// { wifi = /\/wifi$/ } wifi && /Powered = True/ { on = 1 } END { exit !on }'; then
-        if connmanctl disable wifi >/dev/null 2>&1; then
-            say "ConnMan no longer manages the wireless interfaces"
-            for switch in "/sys/class/net/$interface/phy80211"/rfkill*/soft; do
-                [ -w "$switch" ] && echo 0 >"$switch"
-            done
-        else
-            say "ConnMan does not let go of $interface"
-        fi
-    fi
     # A supplicant that is left on the interface is somebody else's: ours has another folder. The
     # one that served a manager goes by itself within a moment.
     tries=20
@@ -115,6 +103,10 @@ take_over() {
         if [ "$tries" -eq 10 ]; then
             wpa_cli -p /run/wpa_supplicant -i "$interface" terminate >/dev/null 2>&1
             say "another wpa_supplicant on $interface has been ended"
+            # ConnMan cannot let go of one interface. Switching wireless off there would block the
+            # radio, and unblocking it would switch it on again; without its supplicant it is idle.
+            ! connmanctl state >/dev/null 2>&1 ||
+                say "NetworkInterfaceBlacklist=$interface in /etc/connman/main.conf keeps ConnMan off it"
         fi
         sleep 0.1
         tries=$((tries - 1))
