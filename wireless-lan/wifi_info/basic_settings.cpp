@@ -34,6 +34,7 @@ const char *encryption_word(t_encmode encmode)
 static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 {
     GString *text = g_string_new(nullptr);
+
     append_line(text, "iface", iface->name);
     if (iface->isstatic) {
         append_line(text, "addrtype", "static "); // readers of this file rely on the blank
@@ -54,12 +55,15 @@ static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 gboolean save_basic_setting_to_file(const gchar *file)
 {
     const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
+
     if (!iface) {
         fprintf(stderr, "WIRELESS-LAN-DEBUG: no interface, %s is not written\n", file);
         return FALSE;
     }
+
     g_autoptr(GString) text = basic_setting_text(iface);
     g_autoptr(GError) error = nullptr;
+
     if (!replace_file(file, text->str, text->len, &error)) {
         fprintf(stderr, "WIRELESS-LAN-DEBUG: File %s cannot be open.\n", file);
         fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
@@ -88,7 +92,9 @@ static gboolean get_piece(const char *line, int index, char *value)
             return FALSE;
         line++;
     }
+
     g_autofree gchar *piece = g_strndup(line, strcspn(line, " "));
+
     copy_field(value, LINE_SIZE, g_strstrip(piece));
     return TRUE;
 }
@@ -105,6 +111,7 @@ static gboolean find_stanza(FILE *stream, char *line)
 {
     const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
     char name[LINE_SIZE] = ""; // a line without a name leaves the former one
+
     while (next_line(stream, line)) {
         if (!g_str_has_prefix(line, "iface"))
             continue;
@@ -126,6 +133,7 @@ static void set_static(WIFI_INTERFACE *iface, gboolean isstatic)
 static void read_addresses(FILE *stream, char *line)
 {
     char value[LINE_SIZE];
+
     for (const auto &address : ADDRESSES) {
         next_line(stream, line);
         if (get_value(line, address.keyword, value))
@@ -137,6 +145,7 @@ static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
 {
     WIFI_CELL *group = &iface->wifi_group;
     char value[LINE_SIZE];
+
     next_line(stream, line);
     printf("buffer=%s\r\n", line);
     if (get_value(line, "wifigroup", value))
@@ -162,12 +171,15 @@ static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
 void read_basic_settings(FILE *stream)
 {
     WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
+
     if (iface) {
         iface->wifi_group_enable = FALSE;
         iface->wifi_group = {};
     }
+
     char line[LINE_SIZE] = "";
     char value[LINE_SIZE];
+
     if (!find_stanza(stream, line))
         return;
     next_line(stream, line);
@@ -187,6 +199,7 @@ void read_basic_settings_advanced(FILE *stream)
 {
     char line[LINE_SIZE] = "";
     char method[LINE_SIZE];
+
     if (!find_stanza(stream, line))
         return;
     if (get_piece(line, 3, method))
@@ -200,6 +213,7 @@ void read_basic_settings_advanced(FILE *stream)
 static FILE *open_settings(const gchar *file)
 {
     static FILE *settings = nullptr;
+
     g_clear_pointer(&settings, fclose);
     settings = open_text(file);
     return settings;
@@ -208,6 +222,7 @@ static FILE *open_settings(const gchar *file)
 void get_basic_setting_from_file(const gchar *file)
 {
     FILE *stream = open_settings(file);
+
     if (stream)
         read_basic_settings(stream);
 }
@@ -215,6 +230,7 @@ void get_basic_setting_from_file(const gchar *file)
 void get_basic_setting_from_file_Advanced(const gchar *file)
 {
     FILE *stream = open_settings(file);
+
     if (stream)
         read_basic_settings_advanced(stream);
 }
@@ -222,16 +238,21 @@ void get_basic_setting_from_file_Advanced(const gchar *file)
 gchar *get_file_var(const gchar *file, const gchar *var)
 {
     g_autofree gchar *content = nullptr;
+
     if (!g_file_get_contents(file, &content, nullptr, nullptr)) {
         fprintf(stderr, "Could not access file: %s.\n", file);
         return nullptr;
     }
+
     g_auto(GStrv) lines = g_strsplit(content, "\n", 2048);
+
     for (gchar **line = lines; *line; line++) {
         g_strchomp(*line);
         if (**line == '#' || !strstr(*line, var))
             continue;
+
         const gchar *separator = strrchr(*line, '=');
+
         if (!separator)
             separator = strrchr(*line, ' ');
         return separator ? g_strdup(separator + 1) : nullptr;

@@ -18,8 +18,10 @@ static const char *stored_encryption_word(t_encmode encmode)
 gboolean save_preferred_network_to_file(const gchar *file)
 {
     g_autoptr(GString) text = g_string_new(nullptr);
+
     for (int i = 0; i < my_wifi->user_cell_count; i++) {
         const WIFI_CELL *cell = my_wifi->user_wifi_cell[i];
+
         append_number_line(text, "USERCELL", i);
         append_line(text, "ALIAS", cell->alias);
         append_line(text, "ESSID", cell->essid);
@@ -29,7 +31,9 @@ gboolean save_preferred_network_to_file(const gchar *file)
         append_line(text, "Encryption", stored_encryption_word(cell->encmode));
         append_line(text, "KEY", cell->encmode == ENC_OFF ? "off" : cell->userkey);
     }
+
     g_autoptr(GError) error = nullptr;
+
     if (!replace_file(file, text->str, text->len, &error)) {
         fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
         return FALSE;
@@ -41,12 +45,14 @@ gboolean save_preferred_network_to_file(const gchar *file)
 static void copy_rest(char *field, gsize size, char *line)
 {
     gchar *blank = strchr(line, ' ');
+
     copy_field(field, size, blank ? g_strstrip(blank) : nullptr);
 }
 
 static t_encmode read_encryption(const char *line)
 {
     char word[128];
+
     copy_second_word(word, sizeof word, line);
     if (g_str_equal(word, "open"))
         return ENC_OPEN;
@@ -56,6 +62,7 @@ static t_encmode read_encryption(const char *line)
 static guint32 read_number(const char *line)
 {
     char word[128];
+
     copy_second_word(word, sizeof word, line);
     return static_cast<guint32>(decimal(word));
 }
@@ -64,6 +71,7 @@ static guint32 read_number(const char *line)
 static void read_record(FILE *stream, WIFI_CELL *cell)
 {
     char line[LINE_SIZE] = "";
+
     for (int position = 0; position < 7 && fgets(line, sizeof line, stream); position++) {
         switch (position) {
         case 0:
@@ -96,16 +104,21 @@ void read_preferred_networks(FILE *stream)
     char line[LINE_SIZE] = "";
     gboolean left_out = FALSE;
     int count = 0;
+
     while (fgets(line, sizeof line, stream)) {
         if (!g_str_has_prefix(line, "USERCELL"))
             continue;
+
         WIFI_CELL record = {};
+
         read_record(stream, &record);
         if (count == MAX_USER_CELLS) {
             left_out = TRUE;
             continue;
         }
+
         WIFI_CELL *&cell = my_wifi->user_wifi_cell[count++];
+
         if (!cell)
             cell = g_new(WIFI_CELL, 1);
         *cell = record;
@@ -119,6 +132,7 @@ void read_preferred_networks(FILE *stream)
 void get_preferred_network_setting_from_file(const gchar *file)
 {
     FILE *stream = open_text(file);
+
     if (!stream)
         return;
     read_preferred_networks(stream);

@@ -14,12 +14,16 @@
 static gchar *resolve_links(const char *path)
 {
     gchar *name = g_strdup(path);
+
     for (int links = 0; links < 40; links++) {
         g_autofree gchar *target = g_file_read_link(name, nullptr);
+
         if (!target)
             break;
+
         g_autofree gchar *link = name;
         g_autofree gchar *folder = g_path_get_dirname(link);
+
         name = g_path_is_absolute(target) ? g_strdup(target)
                                           : g_build_filename(folder, target, nullptr);
     }
@@ -30,6 +34,7 @@ static int write_all(int fd, const char *content, gsize length)
 {
     while (length > 0) {
         gssize written = write(fd, content, length);
+
         if (written < 0 && errno == EINTR)
             continue;
         if (written < 0)
@@ -45,6 +50,7 @@ static void sync_folder(const char *target)
 {
     g_autofree gchar *folder = g_path_get_dirname(target);
     int fd = open(folder, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+
     if (fd < 0)
         return;
     fsync(fd);
@@ -59,7 +65,9 @@ static int fill(int fd, const struct stat *old, const char *content, gsize lengt
         return errno;
     if (old && fchmod(fd, old->st_mode & 07777) != 0)
         return errno;
+
     int reason = write_all(fd, content, length);
+
     if (reason == 0 && fsync(fd) != 0)
         reason = errno;
     return reason;
@@ -70,9 +78,12 @@ static int write_and_rename(const char *target, const struct stat *old, const ch
 {
     g_autofree gchar *name = g_strconcat(target, ".XXXXXX", nullptr);
     int fd = g_mkstemp_full(name, O_WRONLY | O_CLOEXEC, 0600);
+
     if (fd < 0)
         return errno;
+
     int reason = fill(fd, old, content, length);
+
     close(fd);
     if (reason == 0 && rename(name, target) != 0)
         reason = errno;
@@ -87,7 +98,9 @@ static int overwrite(int fd, const char *content, gsize length)
 {
     if (lseek(fd, 0, SEEK_SET) != 0)
         return errno;
+
     int reason = write_all(fd, content, length);
+
     if (reason == 0 && (ftruncate(fd, static_cast<off_t>(length)) != 0 || fsync(fd) != 0))
         reason = errno;
     return reason;
@@ -98,11 +111,14 @@ static int overwrite(int fd, const char *content, gsize length)
 static int write_in_place(const char *target, const char *content, gsize length)
 {
     int fd = open(target, O_RDWR | O_CLOEXEC);
+
     if (fd < 0)
         return errno;
+
     g_autofree gchar *old = nullptr;
     gsize old_length = 0;
     int reason = EIO;
+
     if (g_file_get_contents(target, &old, &old_length, nullptr)) {
         reason = length > 0 ? posix_fallocate(fd, 0, static_cast<off_t>(length)) : 0;
         if (reason == 0)
@@ -138,6 +154,7 @@ gboolean replace_file(const char *path, const char *content, gsize length, GErro
     struct stat old;
     gboolean exists = lstat(target, &old) == 0;
     int reason = exists ? check_type(old.st_mode) : errno;
+
     if (reason == 0 || reason == ENOENT)
         reason = write_and_rename(target, exists ? &old : nullptr, content, length);
     if (exists && may_write_in_place(reason))

@@ -31,6 +31,7 @@ static const struct {
 static gchar *unquote(gchar *name)
 {
     gsize length = strlen(name);
+
     if (name[0] == '"')
         name[0] = ' ';
     if (name[length - 1] == '"')
@@ -51,7 +52,9 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
     for (gsize i = 0; i < G_N_ELEMENTS(VALUES); i++) {
         if (keywords_used[i])
             continue;
+
         g_autofree gchar *value = VALUES[i].extract(line, VALUES[i].keyword, 0);
+
         if (!value)
             continue;
         keywords_used[i] = TRUE;
@@ -74,10 +77,13 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
 static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
 {
     gboolean keywords_used[G_N_ELEMENTS(VALUES)] = {};
+
     do {
         if (take_value(line, keywords_used, cell))
             continue;
+
         g_autofree gchar *bit_rates = get_string_value(line, "Bit Rates:", 0);
+
         if (bit_rates)
             return;
     } while (fgets(line, LINE_SIZE, stream));
@@ -93,12 +99,16 @@ static void release_cells()
 void read_cells(FILE *stream)
 {
     release_cells();
+
     char line[LINE_SIZE] = "";
+
     while (fgets(line, sizeof line, stream)) {
         if (!strstr(line, "Cell"))
             continue;
         fprintf(stderr, "WIRELESS-LAN-DEBUG: FIND CELL[%d]\n", my_wifi->cell_count);
+
         WIFI_CELL *cell = g_new0(WIFI_CELL, 1);
+
         copy_field(cell->state, sizeof cell->state, gettext("Disconnect"));
         cell->linkstate = 2;
         read_cell(stream, line, cell);
@@ -118,8 +128,10 @@ void get_cell(WIFI_INTERFACE *iface)
         return;
     }
     bring_interface_up(iface->name);
+
     g_autofree gchar *command = g_strdup_printf("iwlist %s scan", iface->name);
     FILE *pipe = popen(command, "r");
+
     if (!pipe) {
         perror("pipe");
         return;

@@ -7,6 +7,7 @@
 gchar *shell_escape(const char *text)
 {
     GString *escaped = g_string_new(nullptr);
+
     for (; *text; text++) {
         if (strchr("\"\\$`", *text))
             g_string_append_c(escaped, '\\');
@@ -18,6 +19,7 @@ gchar *shell_escape(const char *text)
 gchar *echo_command(const char *text, const char *path)
 {
     g_autofree gchar *escaped = shell_escape(text);
+
     // An echo may take "-n" for an option, and that of dash turns "\t" into a tabulator.
     if (text[0] == '-' || strchr(text, '\\'))
         return g_strdup_printf("printf '%%s\\n' \"%s\" >%s", escaped, path);
@@ -27,18 +29,21 @@ gchar *echo_command(const char *text, const char *path)
 void run_command(const char *command)
 {
     int status = system(command);
+
     static_cast<void>(status);
 }
 
 static gboolean is_plain_name(const char *name)
 {
     gsize length = strlen(name);
+
     if (length == 0 || length > 15 || g_str_equal(name, ".") || g_str_equal(name, ".."))
         return FALSE;
     if (name[0] == '-') // an option to the commands
         return FALSE;
     for (; *name; name++) {
         guchar byte = static_cast<guchar>(*name);
+
         if (byte <= ' ' || byte == 0x7F || byte == 0xA0 ||
             strchr("/:|&;<>()$`\\\"'*?[]#~=!{}^", byte))
             return FALSE;
@@ -58,6 +63,8 @@ void bring_interface_up(const char *name)
 {
     if (!interface_usable(name, "ifconfig up"))
         return;
+
     g_autofree gchar *command = g_strdup_printf("/sbin/ifconfig %s up", name);
+
     run_command(command);
 }

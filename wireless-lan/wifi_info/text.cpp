@@ -12,15 +12,19 @@ static const char WHITE_SPACE[] = " \t\n\v\f\r";
 static gsize whole_characters(const char *text, gsize length)
 {
     gsize start = length;
+
     while (start > 0 && length - start < 3 && (text[start] & 0xC0) == 0x80)
         start--;
+
     gsize end = start + static_cast<gsize>(g_utf8_skip[static_cast<guchar>(text[start])]);
+
     return end > length ? start : length;
 }
 
 void copy_field(char *field, gsize size, const char *text)
 {
     gsize length = text ? strnlen(text, size) : 0;
+
     if (length == size)
         length = whole_characters(text, size - 1);
     if (length > 0)
@@ -37,6 +41,7 @@ FILE *open_text(const gchar *file)
 {
     FILE *stream = fopen(file, "re");
     struct stat status;
+
     if (stream && fstat(fileno(stream), &status) == 0 && S_ISDIR(status.st_mode)) {
         fclose(stream);
         stream = nullptr;
@@ -51,7 +56,9 @@ void copy_second_word(char *field, gsize size, const char *text)
     text += strspn(text, WHITE_SPACE);
     text += strcspn(text, WHITE_SPACE);
     text += strspn(text, WHITE_SPACE);
+
     g_autofree gchar *word = g_strndup(text, strcspn(text, WHITE_SPACE));
+
     copy_field(field, size, word);
 }
 
@@ -63,6 +70,7 @@ int decimal(const char *text)
 void append_line(GString *content, const char *keyword, const char *value)
 {
     g_autofree gchar *line = g_strdup(value);
+
     g_strdelimit(line, "\r\n", ' ');
     g_string_append_printf(content, "%s %s\n", keyword, line);
 }
