@@ -207,9 +207,17 @@ def idle():
     until(is_idle, "the window is idle", 120)
 
 
+def searches():
+    """How many searches the desktop has been told of."""
+    with open(f"{LOGS}/notices.log") as file:
+        return file.read().count('= "5"')
+
+
 def refresh():
+    # A search blocks the window: to look at it meanwhile may be to see it afterwards.
+    before = searches()
     press(widget("button-refresh"))
-    until(lambda: title() != IDLE or not widget("button-refresh")["usable"], "the search begins")
+    until(lambda: searches() > before, "the search begins")
     idle()
 
 
