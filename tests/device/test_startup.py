@@ -170,6 +170,40 @@ def test_no_interface(device):
     assert app.quit() == 0
 
 
+def test_the_first_picture_comes_before_the_first_scan(device, tmp_path):
+    # The refresh looks for the interface first; there it is held while the screen is looked at.
+    d = device("street")
+    d.command("cat", hook="""
+if [ -e /device/state/loaded ]; then
+    until [ -e /device/state/seen ]; do sleep 0.1; done
+fi
+: >/device/state/loaded
+""")
+    app = d.start(wait=False)
+    d.wait_command("cat", 2, ended=False)
+    picture = d.display.screenshot(str(tmp_path / "first.png"))
+    # Inside the frame that the window manager draws: text has many shades, an empty window one.
+    shades = subprocess.run(["identify", "-format", "%k", f"{picture}[600x440+60+150]"],
+                            check=True, stdout=subprocess.PIPE).stdout
+    assert int(shades) > 100
+    assert len(d.commands("cat")) == 2 and d.notices() == []
+    d.write("/device/state/seen", b"")
+    app.wait()
+    app.wait_listed()
+    assert app.quit() == 0
+
+
+def test_no_memory_for_the_state(device):
+    d = device("street")
+    library = f"{d.state}/no-memory.so"
+    subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-o", library, "-"], check=True,
+                   input=b"void *g_try_malloc0(unsigned long n) { (void)n; return (void *)0; }")
+    app = d.start(wait=False, environment={"LD_PRELOAD": library})
+    assert app.wait_end() == 0
+    assert "WIRELESS-LAN-DEBUG: my_wifi_init error!!!\r\n" in app.stderr()
+    assert d.commands() == []
+
+
 def test_translated_texts(device):
     catalogue = subprocess.run(["msgfmt", "-o", "-", f"{TOP}/po/de.po"], check=True,
                                stdout=subprocess.PIPE).stdout

@@ -10,7 +10,7 @@
 #include "window/main_window.h"
 
 static const char TEXT_DOMAIN[] = "wireless-lan";
-// A window that is never exposed (started behind others) still gets its first scan.
+// A window that is not shown (started as an icon) still gets its first scan.
 static const guint UNSEEN_MS = 1000;
 
 static void prepend_device_path()
@@ -47,12 +47,15 @@ static gboolean start_jobs(gpointer)
     return FALSE;
 }
 
-// The jobs come after the first picture: the scan blocks the window. They are idle jobs of a lower
-// priority than drawing, so what this first exposure brings is drawn before they run.
-static gboolean cb_first_exposure(GtkWidget *widget, GdkEvent *, gpointer handler)
+// The jobs come after the first picture: the scan blocks the window. What becomes visible is
+// exposed at the same time, so after a round trip to the X server the exposures are here, and they
+// are drawn before idle jobs run. (An expose-event would not do: the first one comes of GTK+
+// itself, before the window manager shows the window.)
+static gboolean cb_first_sight(GtkWidget *widget, GdkEvent *, gpointer)
 {
-    g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_exposure),
-                                         handler);
+    g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_sight),
+                                         nullptr);
+    gdk_display_sync(gtk_widget_get_display(widget));
     if (unseen_timer != 0) {
         g_source_remove(unseen_timer);
         start_jobs(nullptr);
@@ -87,7 +90,8 @@ int main(int argc, char **argv)
     gtk_widget_show_all(pane);
     set_default_width(GTK_WINDOW(mainwindow));
 
-    g_signal_connect(mainwindow, "expose-event", G_CALLBACK(cb_first_exposure), nullptr);
+    gtk_widget_add_events(mainwindow, GDK_VISIBILITY_NOTIFY_MASK);
+    g_signal_connect(mainwindow, "visibility-notify-event", G_CALLBACK(cb_first_sight), nullptr);
     unseen_timer = g_timeout_add(UNSEEN_MS, start_jobs, nullptr);
     gtk_widget_show_all(mainwindow);
     gtk_main();
