@@ -32,11 +32,15 @@ static void cb_leave(GtkWidget *, gpointer)
     gtk_main_quit();
 }
 
-static guint unseen_timer = 0; // 0: the start-up jobs are queued
+static guint unseen_timer = 0; // 0: it has fired or is not needed any more
 
+// Queues the jobs behind the first picture, since the scan blocks the window. What became visible
+// was exposed at the same time, so after a round trip to the X server the exposures are here, and
+// they are drawn before idle jobs run.
 static gboolean start_jobs(gpointer)
 {
     unseen_timer = 0;
+    gdk_display_sync(gdk_display_get_default());
     g_idle_add(
         [](gpointer) -> gboolean {
             cb_active_device(nullptr, nullptr);
@@ -47,18 +51,15 @@ static gboolean start_jobs(gpointer)
     return FALSE;
 }
 
-// The jobs come after the first picture: the scan blocks the window. What becomes visible is
-// exposed at the same time, so after a round trip to the X server the exposures are here, and they
-// are drawn before idle jobs run. (An expose-event would not do: the first one comes of GTK+
-// itself, before the window manager shows the window.)
+// The first expose-event would say less: it comes of GTK+ itself, before the window manager shows
+// the window.
 static gboolean cb_first_sight(GtkWidget *widget, GdkEvent *, gpointer)
 {
     g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_sight),
                                          nullptr);
-    gdk_display_sync(gtk_widget_get_display(widget));
     if (unseen_timer != 0) {
         g_source_remove(unseen_timer);
-        start_jobs(nullptr);
+        g_idle_add(start_jobs, nullptr);
     }
     return FALSE;
 }
