@@ -3,12 +3,12 @@
 #include <string>
 #include <vector>
 
-#include <dirent.h>
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <unistd.h>
 
 #include "connection/interface_state.h"
+#include "descriptors.h"
 
 // What the kernel's list holds; NULL: it cannot be opened.
 static const std::string *list = nullptr;
@@ -91,17 +91,6 @@ TEST(NetworkStatics, StopsWhereTheLineEnds)
     EXPECT_EQ(printed_for("w", "w: zz 7. x\n"),
               "WIRELESS-LAN-DEBUG: bp--->zz\nWIRELESS-LAN-DEBUG: status=0\n"
               "WIRELESS-LAN-DEBUG: link quality--->7\nWIRELESS-LAN-DEBUG: level=0\n");
-}
-
-static size_t open_descriptors()
-{
-    size_t count = 0;
-    DIR *folder = opendir("/proc/self/fd");
-
-    while (readdir(folder) != nullptr)
-        count++;
-    closedir(folder);
-    return count;
 }
 
 // Whatever stands in the list, at most the five lines come out and no descriptor stays.

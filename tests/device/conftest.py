@@ -28,32 +28,9 @@ def pytest_runtest_makereport(item, call):
             report.sections.append(("device", f"screenshot and logs in {folder}"))
 
 
-@pytest.fixture
-def device():
-    """Makes devices: device("street", rate=50, ...); they end with the test, which fails when the
-    program complained (GTK+ warnings, sanitizer reports) without the test expecting it."""
-    made = []
-
-    def make(*arguments, **settings):
-        one = Device(*arguments, **settings)
-        made.append(one)
-        OPEN.append(one)
-        return one
-
-    yield make
-    try:
-        for one in made:
-            one.check_quiet()
-    finally:
-        for one in made:
-            if one in OPEN:
-                OPEN.remove(one)
-            one.close()
-
-
-@pytest.fixture(scope="module")
-def shared_device():
-    """The same, for all tests of a module."""
+def devices():
+    """Makes devices until it is closed; fails then when a program complained (GTK+ warnings,
+    sanitizer reports) without its test expecting it."""
     made = []
 
     def make(*arguments, **settings):
@@ -70,3 +47,15 @@ def shared_device():
         for one in made:
             OPEN.remove(one)
             one.close()
+
+
+@pytest.fixture
+def device():
+    """Makes devices: device("street", rate=50, ...); they end with the test."""
+    yield from devices()
+
+
+@pytest.fixture(scope="module")
+def shared_device():
+    """The same, for all tests of a module."""
+    yield from devices()
