@@ -14,6 +14,8 @@
 #include "base/state.h"
 #include "floor_scan.h"
 #include "floor_window.h"
+#include "wifi.h"
+#include "wifi_info/scan.h"
 #include "window/main_window.h"
 
 static floor_row rows[FLOOR_ROWS];

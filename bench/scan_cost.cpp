@@ -9,6 +9,8 @@
 #include <ctime>
 
 #include "wifi.h"
+#include "wifi_info/scan.h"
+#include "wifi_info/text.h"
 
 // get_cell brings the interface up first. That is a shell and a command of its own, and no part of
 // what is compared here; nothing else in this program uses it.

@@ -4,6 +4,7 @@
 
 #include "base/state.h"
 #include "connection/monitor.h"
+#include "wifi.h"
 
 struct ChosenNetwork : testing::Test {
     WIFI_CELL chosen = {};

@@ -6,6 +6,9 @@
 #include <unistd.h>
 
 #include "connection/commands.h"
+#include "wifi.h"
+#include "wifi_info/encryption.h"
+#include "wifi_info/shell.h"
 
 static WIFI_CELL make_cell(const char *essid, const char *mode, const char *key)
 {

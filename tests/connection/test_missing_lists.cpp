@@ -6,6 +6,7 @@
 
 #include "base/state.h"
 #include "connection/encrypted_dialog.h"
+#include "wifi.h"
 
 static const std::string MESSAGE = "WIRELESS-LAN-DEBUG: user_cell_list_backend get failed.\n";
 

@@ -9,6 +9,7 @@
 
 #include "connection/interface_state.h"
 #include "descriptors.h"
+#include "wifi.h"
 
 // What the kernel's list holds; NULL: it cannot be opened.
 static const std::string *list = nullptr;

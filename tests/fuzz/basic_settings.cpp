@@ -1,9 +1,10 @@
 // The basic settings: read over flags that the first byte chooses, written and read again.
 
+#include "wifi_info/basic_settings.h"
 #include "fuzz.h"
 #include "support/model.h"
 #include "support/state.h"
-#include "wifi_info/readers.h"
+#include "wifi.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

@@ -3,7 +3,7 @@
 #include "fuzz.h"
 #include "support/model.h"
 #include "support/state.h"
-#include "wifi_info/readers.h"
+#include "wifi_info/basic_settings.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

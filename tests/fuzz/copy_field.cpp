@@ -2,7 +2,7 @@
 
 #include "fuzz.h"
 #include "support/model.h"
-#include "wifi.h"
+#include "wifi_info/text.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

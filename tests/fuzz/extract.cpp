@@ -2,7 +2,7 @@
 
 #include "fuzz.h"
 #include "support/model.h"
-#include "wifi.h"
+#include "wifi_info/scan.h"
 
 static void check(const std::string &line, const std::string &keyword, bool unit,
                   const std::string &separator,

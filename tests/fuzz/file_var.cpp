@@ -5,7 +5,7 @@
 
 #include "fuzz.h"
 #include "support/model.h"
-#include "wifi.h"
+#include "wifi_info/basic_settings.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

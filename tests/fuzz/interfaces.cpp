@@ -1,9 +1,11 @@
 // The kernel's list of wireless interfaces.
 
+#include "wifi_info/interfaces.h"
 #include "fuzz.h"
 #include "support/model.h"
 #include "support/state.h"
-#include "wifi_info/readers.h"
+#include "wifi.h"
+#include "wifi_info/shell.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

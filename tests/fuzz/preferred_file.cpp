@@ -1,9 +1,9 @@
 // The preferred networks: read, written and read again.
 
+#include "wifi_info/preferred_file.h"
 #include "fuzz.h"
 #include "support/model.h"
 #include "support/state.h"
-#include "wifi_info/readers.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

@@ -1,9 +1,10 @@
 // The output of iwlist, read twice over: the second scan releases the records of the first.
 
+#include "wifi_info/scan.h"
 #include "fuzz.h"
 #include "support/model.h"
 #include "support/state.h"
-#include "wifi_info/readers.h"
+#include "wifi.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

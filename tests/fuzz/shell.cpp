@@ -1,8 +1,8 @@
 // Text inside command lines: a shell makes one word of it, the same text.
 
+#include "wifi_info/shell.h"
 #include "fuzz.h"
 #include "support/model.h"
-#include "wifi.h"
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
 {

@@ -17,6 +17,7 @@
 #include "base/widgets.h"
 #include "preferred/list_dialog.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 using std::string;
 

@@ -6,6 +6,9 @@
 #include <unistd.h>
 
 #include "support/state.h"
+#include "wifi.h"
+#include "wifi_info/basic_settings.h"
+#include "wifi_info/preferred_file.h"
 
 static void fill(char *field, gsize size, char byte)
 {

@@ -8,6 +8,9 @@
 #include "base/widgets.h"
 #include "settings/adhoc_dialog.h"
 #include "settings/wlan_dialog.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/text.h"
 
 static void (*under_dialog)(GtkDialog *);
 

@@ -5,6 +5,7 @@
 #include <functional>
 
 #include "state.h"
+#include "wifi.h"
 
 namespace model
 {

@@ -1,4 +1,5 @@
 #include "state.h"
+#include "wifi.h"
 
 #include <cstdlib>
 #include <cstring>

@@ -6,6 +6,9 @@
 #include "support/model.h"
 #include "support/random_text.h"
 #include "support/state.h"
+#include "wifi.h"
+#include "wifi_info/basic_settings.h"
+#include "wifi_info/text.h"
 
 using namespace std::string_literals;
 

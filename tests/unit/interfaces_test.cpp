@@ -5,6 +5,10 @@
 #include "support/commands.h"
 #include "support/goldens.h"
 #include "support/state.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/scan.h"
+#include "wifi_info/text.h"
 
 static const char HEADER[] = "Inter-| sta-|\n face | tus | link\n";
 

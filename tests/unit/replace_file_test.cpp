@@ -9,7 +9,7 @@
 #include <unistd.h>
 
 #include "support/commands.h"
-#include "wifi.h"
+#include "wifi_info/replace_file.h"
 
 namespace fs = std::filesystem;
 

@@ -4,6 +4,9 @@
 #include "support/goldens.h"
 #include "support/model.h"
 #include "support/state.h"
+#include "wifi.h"
+#include "wifi_info/scan.h"
+#include "wifi_info/text.h"
 
 static const char START[] = "WIRELESS-LAN-DEBUG: get cell start...\n";
 static const char NETWORK[] = "          Cell 01 - Address: 00:11:22:33:44:55\n"

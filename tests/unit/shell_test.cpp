@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "support/commands.h"
-#include "wifi.h"
+#include "wifi_info/shell.h"
 
 static const char *const HOSTILE[] = {
     "",          "home net",     "a\"b",        "a\\b",        "$HOME",        "$(id)",

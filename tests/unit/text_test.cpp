@@ -1,6 +1,5 @@
 #include <gtest/gtest.h>
 
-#include "wifi.h"
 #include "wifi_info/text.h"
 
 // "é" is C3 A9, "☕" E2 98 95, U+1F4F6 is F0 9F 93 B6.

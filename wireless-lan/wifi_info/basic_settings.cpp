@@ -1,8 +1,11 @@
+#include "wifi_info/basic_settings.h"
+
 #include <cstdio>
 #include <cstring>
 
 #include "wifi.h"
-#include "wifi_info/readers.h"
+#include "wifi_info/encryption.h"
+#include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
 
 constexpr int LINE_SIZE = 255;
@@ -17,19 +20,6 @@ static const struct {
     {"broadcast", static_broadcast},
     {"gateway", static_gateway},
 };
-
-const char *encryption_word(t_encmode encmode)
-{
-    switch (encmode) {
-    case ENC_OFF:
-        return "off";
-    case ENC_OPEN:
-        return "open";
-    case ENC_RESTRICTED:
-        break;
-    }
-    return "restricted";
-}
 
 static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 {

@@ -1,8 +1,10 @@
+#include "wifi_info/interfaces.h"
+
 #include <cstdio>
 #include <cstring>
 
 #include "wifi.h"
-#include "wifi_info/readers.h"
+#include "wifi_info/text.h"
 
 // Puts the name at the start of `line` into a slot; a record that is there keeps all the rest.
 static void name_interface(int slot, const char *line)
@@ -50,46 +52,4 @@ gboolean get_interface()
     }
     read_interfaces(pipe);
     return pclose(pipe);
-}
-
-// What stands behind `target`, up to the first separator, or the second one when `unit` is set.
-static gchar *first_pieces(gchar *src, const gchar *target, const char *separator, int unit)
-{
-    gchar *keyword = strstr(src, target);
-
-    if (!keyword)
-        return nullptr;
-
-    gchar *first = g_strstrip(keyword + strlen(target));
-
-    if (*first == '\0')
-        return nullptr;
-
-    const gchar *first_end = strstr(first, separator);
-
-    if (!first_end)
-        return g_strdup(first);
-
-    gchar *piece = g_strndup(first, static_cast<gsize>(first_end - first));
-
-    if (!unit)
-        return piece;
-
-    const gchar *second = first_end + strlen(separator);
-    const gchar *second_end = strstr(second, separator);
-    g_autofree gchar *head = piece;
-    g_autofree gchar *tail =
-        second_end ? g_strndup(second, static_cast<gsize>(second_end - second)) : g_strdup(second);
-
-    return g_strconcat(head, " ", tail, nullptr);
-}
-
-gchar *get_string_value(gchar *src, const gchar *target, int unit)
-{
-    return first_pieces(src, target, " ", unit);
-}
-
-gchar *get_essid_value(gchar *src, const gchar *target, int unit)
-{
-    return first_pieces(src, target, "        ", unit);
 }

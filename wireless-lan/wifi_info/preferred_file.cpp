@@ -1,8 +1,10 @@
+#include "wifi_info/preferred_file.h"
+
 #include <cstdio>
 #include <cstring>
 
 #include "wifi.h"
-#include "wifi_info/readers.h"
+#include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
 
 constexpr int LINE_SIZE = 255;

@@ -1,11 +1,11 @@
+#include "wifi_info/replace_file.h"
+
 #include <cerrno>
 #include <cstdio>
 
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-#include "wifi.h"
 
 // The functions here that return an int return 0 or the errno of what failed.
 

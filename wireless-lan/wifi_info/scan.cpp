@@ -1,12 +1,58 @@
+#include "wifi_info/scan.h"
+
+#include <cstddef>
 #include <cstdio>
 #include <cstring>
 
 #include <libintl.h>
 
 #include "wifi.h"
-#include "wifi_info/readers.h"
+#include "wifi_info/shell.h"
+#include "wifi_info/text.h"
 
 constexpr int LINE_SIZE = 512;
+
+// What stands behind `target`, up to the first separator, or the second one when `unit` is set.
+static gchar *first_pieces(gchar *src, const gchar *target, const char *separator, int unit)
+{
+    gchar *keyword = strstr(src, target);
+
+    if (!keyword)
+        return nullptr;
+
+    gchar *first = g_strstrip(keyword + strlen(target));
+
+    if (*first == '\0')
+        return nullptr;
+
+    const gchar *first_end = strstr(first, separator);
+
+    if (!first_end)
+        return g_strdup(first);
+
+    gchar *piece = g_strndup(first, static_cast<gsize>(first_end - first));
+
+    if (!unit)
+        return piece;
+
+    const gchar *second = first_end + strlen(separator);
+    const gchar *second_end = strstr(second, separator);
+    g_autofree gchar *head = piece;
+    g_autofree gchar *tail =
+        second_end ? g_strndup(second, static_cast<gsize>(second_end - second)) : g_strdup(second);
+
+    return g_strconcat(head, " ", tail, nullptr);
+}
+
+gchar *get_string_value(gchar *src, const gchar *target, int unit)
+{
+    return first_pieces(src, target, " ", unit);
+}
+
+gchar *get_essid_value(gchar *src, const gchar *target, int unit)
+{
+    return first_pieces(src, target, "        ", unit);
+}
 
 // What iwlist says about a network. The order is the one in which the keywords of a line are tried.
 static const struct {

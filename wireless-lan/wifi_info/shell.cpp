@@ -1,8 +1,8 @@
+#include "wifi_info/shell.h"
+
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-
-#include "wifi.h"
 
 gchar *shell_escape(const char *text)
 {

@@ -4,8 +4,6 @@
 
 #include <sys/stat.h>
 
-#include "wifi.h"
-
 static const char WHITE_SPACE[] = " \t\n\v\f\r";
 
 // How many of the first `length` bytes are whole characters; `text` is longer than that.

@@ -1,4 +1,4 @@
-// Texts and lines, for the files of this unit.
+// Texts, fields and lines.
 
 #ifndef WIFI_INFO_TEXT_H
 #define WIFI_INFO_TEXT_H
@@ -6,6 +6,14 @@
 #include <cstdio>
 
 #include <glib.h>
+
+// Copies `text` into a fixed field of `size` bytes: cut to the field, never inside a UTF-8
+// character, always NUL-terminated. `text` may be NULL (an empty field) or lie inside the field.
+void copy_field(char *field, gsize size, const char *text);
+
+// Logs GLib's failed-precondition message with a plain function name and the literal expression;
+// g_return_if_fail of C++ would log the whole signature.
+void log_critical(const char *function, const char *expression);
 
 // Opens a text file for reading, close-on-exec. NULL for one that cannot be opened, a folder among
 // them; standard error says so.

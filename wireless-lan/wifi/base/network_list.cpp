@@ -1,7 +1,11 @@
 #include "base/network_list.h"
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
+#include "wifi.h"
+#include "wifi_info/text.h"
 
 void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, const gchar *Key,
                     const gchar *Quality, const gchar *State)

@@ -2,6 +2,8 @@
 
 #include <cstring>
 
+#include "wifi.h"
+
 GtkWidget *mainwindow = nullptr;
 gint connect_index = 0;
 gint pid_dhclient = 0;

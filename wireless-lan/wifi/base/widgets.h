@@ -5,10 +5,6 @@
 #define WIFI_BASE_WIDGETS_H
 
 #include <gtk/gtk.h>
-#include <libintl.h>
-
-#define _(text) gettext(text)
-#define N_(text) text
 
 // Registers `widget` on the main window under `key`. A later widget under the same key replaces it;
 // a widget that is destroyed leaves the registry by itself.

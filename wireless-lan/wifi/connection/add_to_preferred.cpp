@@ -1,10 +1,12 @@
 #include "connection/add_to_preferred.h"
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
-#include "base/widgets.h"
 #include "connection/commands.h"
 #include "connection/question.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 void Add2Preferred(GtkWidget *parent)
 {

@@ -12,10 +12,16 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <glib/gi18n.h>
+
 #include "base/desktop.h"
 #include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
+#include "wifi.h"
+#include "wifi_info/encryption.h"
+#include "wifi_info/shell.h"
+#include "wifi_info/text.h"
 
 static const char ESSID_FILE[] = "/tmp/essid_tmp";
 static const char KEY_FILE[] = "/tmp/key_tmp";

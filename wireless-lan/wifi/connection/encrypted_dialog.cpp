@@ -4,9 +4,13 @@
 #include <cstring>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
 #include "preferred/store.h"
+#include "wifi.h"
+#include "wifi_info/text.h"
 
 static const guint PADDING = 5;
 

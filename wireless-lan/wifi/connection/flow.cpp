@@ -3,6 +3,8 @@
 #include <cstdio>
 #include <cstring>
 
+#include <glib/gi18n.h>
+
 #include "base/desktop.h"
 #include "base/network_list.h"
 #include "base/state.h"
@@ -12,6 +14,9 @@
 #include "connection/encrypted_dialog.h"
 #include "connection/monitor.h"
 #include "connection/question.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/text.h"
 
 // Long enough for the new status to be drawn before the commands block the window.
 static const guint COMMAND_DELAY_MS = 100;

@@ -15,6 +15,8 @@
 #include <linux/wireless.h>
 
 #include "base/state.h"
+#include "wifi.h"
+#include "wifi_info/text.h"
 
 static gboolean request_address(const char *name, struct ifreq *request)
 {

@@ -4,12 +4,16 @@
 #include <cstring>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/desktop.h"
 #include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
 #include "connection/commands.h"
 #include "connection/interface_state.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
 
 static const int POLL_LIMIT = 21;
 

@@ -2,10 +2,10 @@
 
 #include <cstdio>
 
-#include "base/state.h"
 #include "base/widgets.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 // Adds what is entered as the last row and selects it. FALSE: the user was told what is wrong.
 static gboolean add_network(GtkWidget *dialog)

@@ -1,8 +1,11 @@
 #include "preferred/delete_dialog.h"
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
 {

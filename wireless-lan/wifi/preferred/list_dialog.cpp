@@ -2,12 +2,15 @@
 
 #include <cstdio>
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
 #include "preferred/add_dialog.h"
 #include "preferred/delete_dialog.h"
 #include "preferred/properties_dialog.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 // Scrolls to a row; the list itself does not, as it stands in a viewport at its full height.
 static void reveal_row(GtkWidget *front, gint row)

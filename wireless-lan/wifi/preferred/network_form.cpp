@@ -4,6 +4,8 @@
 #include <cstring>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/widgets.h"
 #include "wifi.h"
 

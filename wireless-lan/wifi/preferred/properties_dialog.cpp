@@ -7,6 +7,7 @@
 #include "base/widgets.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
+#include "wifi.h"
 
 static const network_form &form = properties_form;
 

@@ -3,8 +3,13 @@
 #include <cstdio>
 #include <cstring>
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
+#include "wifi.h"
+#include "wifi_info/preferred_file.h"
+#include "wifi_info/text.h"
 
 // A reference of our own keeps both alive while no dialog shows them; the add prompt appends to
 // them then.

@@ -3,8 +3,11 @@
 #include <cstdio>
 #include <cstring>
 
+#include <glib/gi18n.h>
+
 #include "base/widgets.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
 // Only the ESSID is shown. The other widgets are never placed in the window: they carry the
 // network's encryption and key from one opening to the next.

@@ -5,6 +5,8 @@
 #include <cstdio>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/desktop.h"
 #include "base/network_list.h"
 #include "base/state.h"
@@ -12,6 +14,11 @@
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "connection/monitor.h"
+#include "wifi.h"
+#include "wifi_info/basic_settings.h"
+#include "wifi_info/encryption.h"
+#include "wifi_info/shell.h"
+#include "wifi_info/text.h"
 
 // Time for the new settings to reach the interface before its address is looked at.
 static const guint FOLLOW_MS = 4000;

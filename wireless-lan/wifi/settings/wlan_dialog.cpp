@@ -3,10 +3,15 @@
 #include <cstdio>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/state.h"
 #include "base/widgets.h"
 #include "settings/adhoc_dialog.h"
 #include "settings/apply.h"
+#include "wifi.h"
+#include "wifi_info/basic_settings.h"
+#include "wifi_info/interfaces.h"
 
 static GtkTooltips *tooltips = nullptr; // one object for every opening
 

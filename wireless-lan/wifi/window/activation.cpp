@@ -3,8 +3,12 @@
 #include <cstdio>
 #include <unistd.h>
 
-#include "base/state.h"
+#include <glib/gi18n.h>
+
 #include "base/widgets.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/shell.h"
 #include "window/refresh.h"
 
 static const char CHECKING_KEY[] = "window-proc-win";

@@ -1,11 +1,11 @@
 #include <cstdio>
 #include <cstdlib>
 
+#include <glib/gi18n.h>
 #include <gtk/gtk.h>
 
 #include "base/desktop.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "window/activation.h"
 #include "window/main_window.h"
 

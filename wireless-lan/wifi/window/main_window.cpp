@@ -1,11 +1,14 @@
 #include "window/main_window.h"
 
+#include <glib/gi18n.h>
+
 #include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
 #include "connection/flow.h"
 #include "preferred/list_dialog.h"
 #include "settings/wlan_dialog.h"
+#include "wifi.h"
 #include "window/activation.h"
 #include "window/refresh.h"
 #include "window/start_up.h"

@@ -4,11 +4,17 @@
 #include <cstring>
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
 #include "base/desktop.h"
 #include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
 #include "connection/interface_state.h"
+#include "wifi.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/scan.h"
+#include "wifi_info/text.h"
 
 // Long enough for "Searching..." to be drawn before the scan blocks the window.
 static const guint SCAN_DELAY_MS = 100;

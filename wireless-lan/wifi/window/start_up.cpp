@@ -5,6 +5,11 @@
 #include "base/state.h"
 #include "preferred/store.h"
 #include "settings/apply.h"
+#include "wifi.h"
+#include "wifi_info/basic_settings.h"
+#include "wifi_info/interfaces.h"
+#include "wifi_info/preferred_file.h"
+#include "wifi_info/shell.h"
 
 void load_configuration()
 {

@@ -1,0 +1,35 @@
+// The settings file, /etc/wireless.conf.
+
+#ifndef WIFI_INFO_BASIC_SETTINGS_H
+#define WIFI_INFO_BASIC_SETTINGS_H
+
+#include <cstdio>
+
+#include <glib.h>
+
+// Writes the settings of wifi_interface[0] and the static_ globals. FALSE when they could not be
+// stored; the old file stands then and standard error has the cause.
+gboolean save_basic_setting_to_file(const gchar *file);
+
+// Reads them back. A file that cannot be opened changes nothing, one without a stanza for the
+// interface only empties the hosted network. The stream stays open until the next call of this
+// reader or the following one.
+void get_basic_setting_from_file(const gchar *file);
+
+// Reads the addressing from a stanza that begins with "iface NAME inet METHOD" instead.
+void get_basic_setting_from_file_Advanced(const gchar *file);
+
+// The two readers over an open stream, which stays open; a read error is its end.
+void read_basic_settings(FILE *stream);
+void read_basic_settings_advanced(FILE *stream);
+
+// The value of the first line of `file` that holds `var` and is no comment: the text behind its
+// last '=', or else behind its last blank. Empty when no line holds it, NULL when the file cannot
+// be read or the line has no value. g_free it.
+gchar *get_file_var(const gchar *file, const gchar *var);
+
+// Copies the second word of `source` into `ret`, at most 127 bytes and the terminator, the empty
+// text when there is none. `keyword` is not looked at.
+void get_paramval(gchar *source, gchar *keyword, gchar *ret);
+
+#endif

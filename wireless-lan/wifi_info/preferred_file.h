@@ -1,0 +1,21 @@
+// The file of the preferred networks, /etc/wireless-user.conf.
+
+#ifndef WIFI_INFO_PREFERRED_FILE_H
+#define WIFI_INFO_PREFERRED_FILE_H
+
+#include <cstdio>
+
+#include <glib.h>
+
+// Writes the user_cell_count preferred networks. FALSE when they could not be stored; the old file
+// stands then and standard error has the cause.
+gboolean save_preferred_network_to_file(const gchar *file);
+
+// Rebuilds user_wifi_cell and user_cell_count from the file. A 65th network is read over and
+// dropped, which one line on standard error says. A file that cannot be opened changes nothing.
+void get_preferred_network_setting_from_file(const gchar *file);
+
+// The same from an open stream, which stays open; a read error is its end.
+void read_preferred_networks(FILE *stream);
+
+#endif
