@@ -8,7 +8,7 @@
 #include <unistd.h>
 
 #include "connection/interface_state.h"
-#include "descriptors.h"
+#include "support/descriptors.h"
 #include "wifi.h"
 
 // What the kernel's list holds; NULL: it cannot be opened.

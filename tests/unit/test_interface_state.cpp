@@ -5,7 +5,7 @@
 
 #include "base/state.h"
 #include "connection/interface_state.h"
-#include "descriptors.h"
+#include "support/descriptors.h"
 #include "wifi.h"
 
 static WIFI_INTERFACE named(const char *name)
