@@ -1,18 +1,13 @@
+# SPDX-License-Identifier: MIT
 """Fixtures of the device tests. A failed test leaves a screenshot and the logs in
 build-device/failed/TEST."""
 
-import os
 import re
-import sys
 
 import pytest
 
-sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
-
-pytest.register_assert_rewrite("harness")
-
-from harness import Device  # noqa: E402
-from harness.device import TOP  # noqa: E402
+from harness import TOP, Device
+from settings_page import close_dialogs
 
 OPEN = []
 
@@ -59,3 +54,21 @@ def device():
 def shared_device():
     """The same, for all tests of a module."""
     yield from devices()
+
+
+@pytest.fixture(scope="module")
+def program(shared_device):
+    """One run of the program for all tests of a module, with the networks of the street listed; no
+    address comes by itself."""
+    device = shared_device("street")
+    device.command("lnk-ifup", hook=":")
+    app = device.start()
+    app.wait_listed()
+    return app
+
+
+@pytest.fixture
+def app(program):
+    """The same; what a test leaves open is closed after it."""
+    yield program
+    close_dialogs(program)

@@ -1,7 +1,7 @@
 """Steps of a connect that several tests take. Time stands still but for what a test lets pass."""
 
 from harness import wait_until
-from harness.device import scan_text
+from support.grammar import scan_text
 
 IDLE = "Wireless network selection"
 CONNECTING = "Connect network..."

@@ -1,6 +1,6 @@
 """What the tests of the settings share: the file, the dialog and the hands on it."""
 
-from harness.wait import wait_until
+from harness import wait_until
 
 CONF = "/etc/wireless.conf"
 PREFIXES = ("address", "netmask", "broadcast", "gateway")

@@ -3,27 +3,13 @@
 import pytest
 from Xlib import X, display as xdisplay
 
-from harness.wait import wait_until
-from settings_page import CONF, GROUP_TITLE, Settings, close_dialogs, dhcp
+from harness import wait_until
+from settings_page import CONF, GROUP_TITLE, Settings, dhcp
 
 EXPAND, FILL = 1, 4
 ENTRY = "GtkEntry"  # the dialog's only one has no name of its own
 NO_ESSID = "Please enter the ESSID."
 NO_KEY = "Please enter the Key."
-
-
-@pytest.fixture(scope="module")
-def program(shared_device):
-    device = shared_device("street")
-    app = device.start()
-    app.wait_listed()
-    return app
-
-
-@pytest.fixture
-def app(program):
-    yield program
-    close_dialogs(program)
 
 
 def hosted(app, **group):

@@ -122,7 +122,7 @@ def test_a_whole_connect_and_back(device):
     for name in LOCKED:
         assert not app.sensitive(name)
     d.wait_command("lnk-ifup", ended=False)
-    d._put("go", "")
+    d.put("go", "")
     script = d.wait_command("lnk-ifup")
     assert script.path == "/sbin/lnk-ifup" and script.argv == ["lnk-ifup", "wlan0"]
     assert script.end_parent == 1

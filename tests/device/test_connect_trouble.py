@@ -8,7 +8,7 @@ from connecting import (ACQUIRING, CONNECTING, IDLE, INVALID, LOCKED, address_of
                         connect, connected, idle, pass_time, poll_address, poll_link, refresh,
                         settle, wait_commands)
 from harness import wait_until
-from harness.device import scan_text
+from support.grammar import scan_text
 
 # fork() fails in the program itself ("p" in the file no-fork) or in a child of it ("c"), and the
 # program has many descriptors, so that one limit leaves it none and its children, who lose them,
@@ -65,7 +65,7 @@ def troubled(device, *networks):
 def copies(d, app):
     """How many processes run the program, on the device and where it was started from."""
     return sum(line.split(b"\0")[0].endswith(b"/wireless-lan")
-               for _, line in children(d._init) + children(app._process.pid))
+               for _, line in children(d.init) + children(app.process.pid))
 
 
 def assert_alone(d, app):
@@ -137,7 +137,7 @@ def test_fork_that_fails(device):
     for count, who in enumerate("pc", 1):
         connect(app, 0)
         wait_commands(d, app, count)
-        d._put("no-fork", who)
+        d.put("no-fork", who)
         d.associate(address_of(0))
         poll_link(d, app)
         assert settle(app) == ACQUIRING
@@ -150,7 +150,7 @@ def test_fork_that_fails(device):
         app.wait_state(0, INVALID)
         assert_usable(app)
         assert app.stderr().count("detect_network_interface_state") == 21 * count
-        d._drop("no-fork")
+        d.drop("no-fork")
         d.dissociate()
         connect(app, 0)
         app.wait_printed("now is link down.", count)

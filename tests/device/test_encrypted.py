@@ -57,10 +57,7 @@ def test_an_unknown_network(device):
     assert not window["resizable"] and not window["allow-shrink"] and not window["allow-grow"]
     assert window["can-default"]
     assert window["type-hint"] == "dialog"
-    above = d.display.root.get_full_property(
-        d.display._x.intern_atom("_NET_CLIENT_LIST_STACKING"), 0).value
-    assert d.display._x.create_resource_object("window", above[-1]).get_wm_name() == \
-        "Encrypted Network"
+    assert d.display.stacking()[-1] == "Encrypted Network"
     assert [one["label"] for one in dialog.all(type="GtkButton")] == ["gtk-cancel", "gtk-ok"]
     assert dialog.find("connect_key")["focus"]
 

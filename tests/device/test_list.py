@@ -3,7 +3,7 @@
 import pytest
 
 from harness import wait_until
-from harness.device import scan_text
+from support.grammar import scan_text
 
 CONTROLS = ["button-network-configure", "button-connect", "button-wifi-settings", "button-refresh",
             "view-press", "button-active-device"]

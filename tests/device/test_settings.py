@@ -2,8 +2,8 @@
 
 import pytest
 
-from harness.wait import wait_until
-from settings_page import (ADDRESSES, CONF, PREFIXES, TITLE, Settings, close_dialogs,
+from harness import wait_until
+from settings_page import (ADDRESSES, CONF, PREFIXES, TITLE, Settings,
                            dhcp, group, static)
 
 EXPAND, FILL = 1, 4
@@ -15,19 +15,6 @@ TOOLTIPS = (
 )
 KEYS = [prefix + "wlan0" for prefix in
         ("dhcp", "static", "auto_dns", "adhoc-host") + PREFIXES]
-
-
-@pytest.fixture(scope="module")
-def program(shared_device):
-    program = shared_device("street").start()
-    program.wait_listed()
-    return program
-
-
-@pytest.fixture
-def app(program):
-    yield program
-    close_dialogs(program)
 
 
 def place(pane, widget):

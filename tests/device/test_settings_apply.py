@@ -4,8 +4,8 @@ import os
 
 import pytest
 
-from harness.wait import wait_until
-from settings_page import ADDRESSES, CONF, PREFIXES, Settings, close_dialogs, dhcp, static
+from harness import wait_until
+from settings_page import ADDRESSES, CONF, PREFIXES, Settings, dhcp, static
 
 LIST_KEYS = ("view-press", "button-connect", "button-refresh")
 OTHER_KEYS = ("button-wifi-settings", "button-network-configure")
@@ -33,22 +33,6 @@ def mark(app):
     """Forgets the commands; gives where the output stands and the states sent so far."""
     app.device.clear_commands()
     return len(app.stdout()), len(app.stderr()), app.device.states()
-
-
-@pytest.fixture(scope="module")
-def program(shared_device):
-    device = shared_device("street")
-    device.command("lnk-ifup")  # the street's own one gives an address after a while
-    device._drop("hooks/lnk-ifup")
-    program = device.start()
-    program.wait_listed()
-    return program
-
-
-@pytest.fixture
-def app(program):
-    yield program
-    close_dialogs(program)
 
 
 # --- refusals
@@ -336,7 +320,7 @@ def test_off_without_an_answer(device):
 @pytest.fixture
 def connected(device):
     one = device("connected", rate=20)
-    one._drop("hooks/lnk-ifup")
+    one.command("lnk-ifup", hook=":")
     program = one.start()
     program.wait_listed()
     program.wait_state(1, "Connected\nIP Address:192.168.7.23")

@@ -5,7 +5,7 @@ import shutil
 import subprocess
 import tempfile
 
-from harness.device import TOP
+from harness import TOP
 
 SIMULATE = f"{TOP}/device/simulate"
 

@@ -7,7 +7,7 @@ import subprocess
 import pytest
 
 from harness import wait_until
-from harness.device import TOP
+from harness import TOP
 
 BUTTONS = {
     "button-refresh": ("gtk-refresh", 1),

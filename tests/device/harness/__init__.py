@@ -1,6 +1,8 @@
+# SPDX-License-Identifier: MIT
 """The real program on a simulated device, driven as a person would drive it; see ../README.md."""
 
-from .device import Device
-from .wait import wait_until
+from probe import wait_until
 
-__all__ = ["Device", "wait_until"]
+from .device import TOP, Device
+
+__all__ = ["Device", "TOP", "wait_until"]

@@ -8,10 +8,12 @@ import subprocess
 import tempfile
 from dataclasses import dataclass
 
-from .app import App, _children
+from probe import LIMIT, wait_until
+from support.grammar import scan_text, to_bytes
+
+from .app import App, child_ids
 from .clock import Clock
 from .display import Display
-from .wait import LIMIT, wait_until
 
 TOP = os.path.dirname(os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__)))))
 
@@ -36,22 +38,11 @@ class Command:
         return os.path.basename(self.path)
 
 
-def _bytes(text):
-    return text if isinstance(text, bytes) else text.encode("utf-8", "surrogateescape")
-
-
 def built():
     """The folder with the device's tools and the probe, built when their sources are newer."""
     folder = subprocess.run([f"{TOP}/device/sim/build"], check=True, stdout=subprocess.PIPE,
                             text=True).stdout.strip()
-    source = f"{TOP}/tests/device/harness/probe.c"
-    probe = f"{folder}/probe.so"
-    if not os.path.exists(probe) or os.path.getmtime(probe) < os.path.getmtime(source):
-        flags = subprocess.run(["pkg-config", "--cflags", "--libs", "gtk+-2.0"], check=True,
-                               stdout=subprocess.PIPE, text=True).stdout.split()
-        subprocess.run(["cc", "-std=gnu11", "-D_GNU_SOURCE", "-O2", "-g", "-w", "-shared", "-fPIC",
-                        "-o", f"{probe}.{os.getpid()}", source] + flags, check=True)
-        os.replace(f"{probe}.{os.getpid()}", probe)
+    subprocess.run([f"{TOP}/tests/probe/build", f"{folder}/probe.so"], check=True)
     return folder
 
 
@@ -72,9 +63,9 @@ class Device:
             shutil.copy(f"{tools}/probe.so", self.state)
             self.clock = None if rate is None else Clock(f"{self.state}/clock", rate)
             for path, content in (files or {}).items():
-                self._put(f"files/{path.lstrip('/')}", content)
+                self.put(f"files/{path.lstrip('/')}", content)
             if interfaces is not None:
-                self._put("interfaces", "".join(name + "\n" for name in interfaces))
+                self.put("interfaces", "".join(name + "\n" for name in interfaces))
             self.display = Display(self.state, size, window_manager)
             self._log = open(f"{self.state}/simulate.log", "wb")
             self._simulate = subprocess.Popen(
@@ -86,7 +77,7 @@ class Device:
                        self._simulate.poll() is not None,
                        lambda: self.state_file("simulate.log").decode(), 60)
             assert self._simulate.poll() is None, self.state_file("simulate.log").decode()
-            self._init = _children(self._simulate.pid)[0]
+            self.init = child_ids(self._simulate.pid)[0]
             if scan is not None:
                 self.set_scan(scan)
         except BaseException:
@@ -104,13 +95,12 @@ class Device:
             self.close()
 
     def close(self):
-        for process in [self._simulate]:
-            if process is not None and process.poll() is None:
-                for child in _children(process.pid):
-                    os.kill(child, 9)
-                process.wait()
+        if self._simulate is not None and self._simulate.poll() is None:
+            for child in child_ids(self._simulate.pid):
+                os.kill(child, 9)
+            self._simulate.wait()
         for app in self.apps:
-            app._disconnect()
+            app.disconnect()
             app.wait_end()
         if self.display is not None:
             self.display.close()
@@ -170,9 +160,9 @@ class Device:
     # The namespaces.
     def _inside(self, *command):
         own_user = ["--user", "--preserve-credentials"]
-        if os.readlink(f"/proc/{self._init}/ns/user") == os.readlink("/proc/self/ns/user"):
+        if os.readlink(f"/proc/{self.init}/ns/user") == os.readlink("/proc/self/ns/user"):
             own_user = []
-        return ["nsenter", "--target", str(self._init), *own_user, "--mount", "--net", "--pid",
+        return ["nsenter", "--target", str(self.init), *own_user, "--mount", "--net", "--pid",
                 "--root", "--wd", *command]
 
     def sh(self, script):
@@ -186,7 +176,7 @@ class Device:
 
     def outer(self, path):
         """Where this machine sees a path of the device."""
-        return f"/proc/{self._init}/root{path}"
+        return f"/proc/{self.init}/root{path}"
 
     def file(self, path):
         """Content of a file on the device (bytes), None when there is none."""
@@ -199,13 +189,13 @@ class Device:
     def write(self, path, content):
         os.makedirs(os.path.dirname(self.outer(path)), exist_ok=True)
         with open(self.outer(path), "wb") as file:
-            file.write(_bytes(content))
+            file.write(to_bytes(content))
 
     def remove(self, path):
         os.unlink(self.outer(path))
 
     def wait_file(self, path, content, limit=LIMIT):
-        wait_until(lambda: self.file(path) == _bytes(content),
+        wait_until(lambda: self.file(path) == to_bytes(content),
                    lambda: f"{path} to be {content!r}; it is {self.file(path)!r}", limit)
 
     # What the device answers.
@@ -216,15 +206,17 @@ class Device:
         except FileNotFoundError:
             return b""
 
-    def _put(self, name, content, mode=0o644):
+    def put(self, name, content, mode=0o644):
+        """Writes a file of the state folder, whole at once."""
         path = f"{self.state}/{name}"
         os.makedirs(os.path.dirname(path), exist_ok=True)
         with open(path + ".new", "wb") as file:
-            file.write(_bytes(content))
+            file.write(to_bytes(content))
         os.chmod(path + ".new", mode)
         os.rename(path + ".new", path)
 
-    def _drop(self, name):
+    def drop(self, name):
+        """Removes a file of the state folder, if there is one."""
         try:
             os.unlink(f"{self.state}/{name}")
         except FileNotFoundError:
@@ -232,7 +224,7 @@ class Device:
 
     def set_scan(self, text):
         """What "iwlist IF scan" prints from now on (bytes or str)."""
-        self._put("scan", text)
+        self.put("scan", text)
 
     def set_networks(self, *networks):
         """The same from (essid, key, quality, mode, mac) tuples; all but the name may be left out:
@@ -241,11 +233,11 @@ class Device:
 
     def set_wireless(self, text):
         """What "cat /proc/net/wireless" prints."""
-        self._put("wireless", text)
+        self.put("wireless", text)
 
     def set_interfaces(self, *names):
         """The interfaces in the kernel's list; the real ones are left as they are."""
-        self._put("wireless", self.sh("wireless-list " + " ".join(names)))
+        self.put("wireless", self.sh("wireless-list " + " ".join(names)))
 
     def command(self, name, delay=None, status=None, stdout=None, stderr=None, hook=None,
                 missing=False):
@@ -254,11 +246,11 @@ class Device:
         for suffix, value in ((".delay", delay), (".exit", status), (".stdout", stdout),
                               (".stderr", stderr)):
             if value is None:
-                self._drop(name + suffix)
+                self.drop(name + suffix)
             else:
-                self._put(name + suffix, value if isinstance(value, (bytes, str)) else str(value))
+                self.put(name + suffix, value if isinstance(value, (bytes, str)) else str(value))
         if hook is not None:
-            self._put(f"hooks/{name}", "#!/bin/sh\nPATH=/device/bin:$PATH\n" + hook, 0o755)
+            self.put(f"hooks/{name}", "#!/bin/sh\nPATH=/device/bin:$PATH\n" + hook, 0o755)
         path = "/usr/bin/cat" if name == "cat" else f"/usr/sbin/{name}"
         if missing:
             self.remove(path)
@@ -267,10 +259,10 @@ class Device:
 
     def associate(self, mac, after=0, count=None):
         """Joins an access point: `after` further requests still find none; for `count` requests."""
-        self._put("ap", f"{mac} {after}" + ("" if count is None else f" {count}"))
+        self.put("ap", f"{mac} {after}" + ("" if count is None else f" {count}"))
 
     def dissociate(self):
-        self._drop("ap")
+        self.drop("ap")
 
     def address(self, ip, interface="wlan0"):
         """Gives the interface a real address; None takes it away."""
@@ -328,24 +320,3 @@ class Device:
         for name in os.listdir(self.state):
             if re.match(r"(stdout|stderr|log|scan|wireless|ap|simulate|display)", name):
                 shutil.copy(f"{self.state}/{name}", folder)
-
-
-def scan_text(*networks):
-    """A scan in the board's form; each network as for Device.set_networks."""
-    lines = [b"wlan0     Scan completed :"]
-    for number, network in enumerate(networks, 1):
-        network = (network,) if isinstance(network, (str, bytes)) else network
-        standard = (None, "off", "70/100", "Master",
-                    f"02:00:00:00:{number // 256:02X}:{number % 256:02X}")
-        essid, key, quality, mode, mac = tuple(network) + standard[len(network):]
-        lines += [
-            b"          Cell %02d - Address: %s" % (number, _bytes(mac)),
-            b'                    ESSID:"%s"' % _bytes(essid),
-            b"                    Mode:" + _bytes(mode),
-            b"                    Frequency:2.437 GHz (Channel 6)",
-            b"                    Quality:%s  Signal level:-50 dBm  Noise level:-95 dBm"
-            % _bytes(quality),
-            b"                    Encryption key:" + _bytes(key),
-            b"                    Bit Rates:54 Mb/s",
-        ]
-    return b"\n".join(lines) + b"\n\n"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Looks at the real program's widgets from outside: a GTK+ module that answers questions on a
 // socket, from the program's own main loop (nested ones of dialogs too). It changes nothing, and
 // answers only when the program has nothing more urgent to do: events handled, sizes settled, idle

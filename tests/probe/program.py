@@ -1,0 +1,380 @@
+# SPDX-License-Identifier: MIT
+"""The running program: what its widgets say (asked of probe.c on a socket), and a person's hands on
+them."""
+
+import json
+import socket
+
+from .wait import LIMIT, wait_until
+
+IDLE = "Wireless network selection"  # the title while nothing is under way
+
+
+def _bytes_back(value):
+    """The probe writes bytes as characters; texts become str again, stray bytes as surrogates."""
+    if isinstance(value, str):
+        return value.encode("latin-1").decode("utf-8", "surrogateescape")
+    if isinstance(value, list):
+        return [_bytes_back(one) for one in value]
+    if isinstance(value, dict):
+        return {key: _bytes_back(one) for key, one in value.items()}
+    return value
+
+
+class Widget(dict):
+    """One widget as it was when the tree was read: type, name, text, label, sensitive, usable
+    (sensitive with all its parents), visible, mapped, rect, focus, default, active, items ..."""
+
+    parent = None
+
+    def walk(self):
+        yield self
+        for child in self["children"]:
+            yield from child.walk()
+
+    def all(self, name=None, type=None, **wanted):
+        """All widgets in this one (itself too) with this name, type and further values."""
+        return [one for one in self.walk()
+                if (name is None or one["name"] == name) and (type is None or one["type"] == type)
+                and all(one.get(key) == value for key, value in wanted.items())]
+
+    def find(self, name=None, type=None, **wanted):
+        found = self.all(name, type, **wanted)
+        assert len(found) == 1, f"{len(found)} widgets {name or type} {wanted} in {self.sketch()}"
+        return found[0]
+
+    def texts(self):
+        """Texts of all visible labels, in the order in which they are built."""
+        return [one["text"] for one in self.walk() if "text" in one and one["type"] != "GtkEntry"
+                and one["visible"]]
+
+    def sketch(self, depth=0):
+        line = "  " * depth + f"{self['type']} {self['name']!r}"
+        for key in ("title", "label", "text"):
+            if self.get(key):
+                line += f" {key}={self[key]!r}"
+        line += "" if self["visible"] else " hidden"
+        line += "" if self["sensitive"] else " insensitive"
+        return "\n".join([line] + [child.sketch(depth + 1) for child in self["children"]])
+
+
+def _widget(node, parent=None):
+    widget = Widget(node)
+    widget.parent = parent
+    widget["children"] = [_widget(child, widget) for child in node["children"]]
+    return widget
+
+
+class Pane:
+    """A window of the program: the main one or a dialog. Looks anew at every question."""
+
+    def __init__(self, app, description, choose):
+        self.app = app
+        self.description = description
+        self._choose = choose
+
+    def now(self):
+        """The window's widget tree, None when there is no such window on the screen."""
+        for window in self.app.windows():
+            if window["visible"] and self._choose(window):
+                return window
+        return None
+
+    def tree(self):
+        found = self.now()
+        assert found, f"no {self.description} on the screen; there is\n{self.app.sketch()}"
+        return found
+
+    def wait(self, limit=LIMIT):
+        wait_until(lambda: (self.now() or {}).get("mapped"),
+                   lambda: f"{self.description}; on the screen is\n{self.app.sketch()}", limit)
+        return self
+
+    def wait_gone(self, limit=LIMIT):
+        wait_until(lambda: self.now() is None, f"{self.description} to go", limit)
+
+    def exists(self):
+        return self.now() is not None
+
+    @property
+    def title(self):
+        return self.tree()["title"]
+
+    def find(self, name=None, type=None, **wanted):
+        """The one widget with this widget name (and type, and values); fails without one."""
+        return self.tree().find(name, type, **wanted)
+
+    def all(self, name=None, type=None, **wanted):
+        return self.tree().all(name, type, **wanted)
+
+    def texts(self):
+        return self.tree().texts()
+
+    def text(self, name):
+        widget = self.find(name)
+        return widget["text"] if "text" in widget else widget["label"]
+
+    def label(self, name):
+        return self.find(name)["label"]
+
+    def sensitive(self, name):
+        return self.find(name)["sensitive"]
+
+    def props(self, widget):
+        """All properties of a widget (or of the one with that name): {"properties", "packing",
+        "size-request"}; packing is what its container holds for it (attach edges, expand ...)."""
+        if isinstance(widget, str):
+            widget = self.find(widget)
+        return self.app.ask("props " + widget["id"])
+
+    def rows(self, name):
+        """Rows of a GtkTreeView or GtkCList by widget name: lists of texts."""
+        return [row["texts"] for row in self.app.ask("rows " + self.find(name)["id"])]
+
+    def columns(self, name):
+        """Columns of a GtkTreeView: {"title", "width", "renderers": [{"id", "type",
+        "foreground"}]}."""
+        return self.app.ask("columns " + self.find(name)["id"])
+
+    def selected(self, name):
+        """Numbers of its selected rows."""
+        rows = self.app.ask("rows " + self.find(name)["id"])
+        return [number for number, row in enumerate(rows) if row["selected"]]
+
+    # Hands.
+    def _button(self, what):
+        buttons = [one for one in self.tree().walk() if one["type"].endswith("Button")]
+        return next((one for one in buttons if one["name"] == what),
+                    next((one for one in buttons if one.get("label") == what), None))
+
+    def press(self, what, limit=LIMIT):
+        """Clicks the button with this name or label ("gtk-ok" is a stock button's label) once it
+        can be clicked."""
+        self.click(lambda: self._button(what), what, limit=limit)
+
+    def click(self, what, description=None, button=1, count=1, limit=LIMIT):
+        """Clicks in the middle of a widget: its name, its record, or a function that finds it."""
+        def found():
+            if callable(what):
+                return what()
+            key, value = ("name", what) if isinstance(what, str) else ("id", what["id"])
+            return next((one for one in self.tree().walk() if one[key] == value), None)
+
+        widget = self._in_place(found, lambda widget: widget["rect"],
+                                f"{description or what} to press", limit)
+        x, y, width, height = widget["rect"]
+        self.app.display.click(x + width // 2, y + height // 2, button, count)
+        return widget
+
+    def _in_place(self, find, place, what, limit=LIMIT):
+        """The widget, once it can be used, its window is in front, and its place is the same twice
+        running: not about to be moved by the window manager."""
+        last = []
+
+        def ready():
+            widget = find()
+            usable = widget and widget["mapped"] and widget["usable"] and widget["rect"][2] > 1 \
+                and self.tree().get("active", True)
+            now = [place(widget)] if usable else []
+            steady = usable and last == now
+            last[:] = now
+            return widget if steady else None
+
+        return wait_until(ready, lambda: f"{what} in\n{self.app.sketch()}", limit)
+
+    def type(self, name, text, replace=True):
+        """Types into an entry, with a click into it when the focus is elsewhere; `replace` takes
+        away what stands there first."""
+        wait_until(lambda: self.tree()["active"], f"{self.description} to be the active window")
+        # A click into the entry that has the focus would leave nothing to wait for, and the window
+        # manager may hold it back until after the keys.
+        if not self.find(name)["focus"]:
+            self.click(name)
+            wait_until(lambda: self.find(name)["focus"], f"the focus on {name}")
+        if replace:
+            self.app.display.key("ctrl+a")
+            self.app.display.key("Delete")
+            wait_until(lambda: self.find(name)["text"] == "", f"{name} to be empty")
+            self.app.display.type(text)
+            wait_until(lambda: self.find(name)["text"] == text,
+                       lambda: f"{name} to hold {text!r}; holds {self.find(name)['text']!r}")
+        else:
+            self.app.display.type(text)
+
+    def choose(self, name, item):
+        """Chooses an item (its text or number) of a combo box in its menu."""
+        combo = self.find(name)
+        wanted = combo["items"].index(item) if isinstance(item, str) else item
+        self.click(name)
+
+        def items():
+            menus = [one for one in self.app.windows() if one["mapped"] and one.all(type="GtkMenu")]
+            return [one for menu in menus for one in menu.walk()
+                    if one["type"].endswith("MenuItem") and one["mapped"]]
+
+        x, y, width, height = wait_until(items, f"the menu of {name}")[wanted]["rect"]
+        self.app.display.click(x + width // 2, y + height // 2)
+        wait_until(lambda: self.find(name)["active"] == wanted, f"{name} to change")
+
+    def cell(self, name, row, column=0):
+        return self.app.ask(f"cell {self.find(name)['id']} {row} {column}")
+
+    def click_row(self, name, row, button=1, count=1, column=0):
+        """Clicks into a row of a list, near the left of the column."""
+        self._in_place(lambda: self.find(name), lambda widget: self.cell(name, row, column), name)
+        self._reach(name, row, column)
+        x, y, width, height = self.cell(name, row, column)
+        self.app.display.click(x + min(width, 40) // 2, y + height // 2, button, count)
+
+    def _reach(self, name, row, column):
+        """Turns the wheel until the row is in sight."""
+        frame = self.find(name)
+        while frame is not None and frame["type"] != "GtkScrolledWindow":
+            frame = frame.parent
+        while frame is not None:
+            left, top, width, height = frame["rect"]
+            _, y, _, cell_height = self.cell(name, row, column)
+            if y >= top and y + cell_height <= top + height:
+                return
+            self.app.display.click(left + width // 2, top + height // 2, 5 if y > top else 4)
+            wait_until(lambda: self.cell(name, row, column)[1] != y, f"{name} to scroll to {row}")
+
+
+class Program(Pane):
+    """The program that runs, and its main window: the widgets of the pane are those of it."""
+
+    def __init__(self, process, socket_path, display, window_manager=True):
+        """`process`: its Popen; `socket_path`: PROBE_SOCKET of its environment; `display`: the
+        Screen that it is on."""
+        self.display, self.window_manager = display, window_manager
+        self._process, self._path = process, socket_path
+        self._socket = None
+        super().__init__(self, "main window", self._is_main)
+
+    def _is_main(self, window):
+        return any(one["name"] == "view-press" for one in window.walk())
+
+    def said(self):
+        """What it printed last, for the message of a failure."""
+        return ""
+
+    def _ended(self):
+        return f"the program ended ({self._process.poll()}):\n{self.said()}"
+
+    # The probe.
+    def ask(self, question):
+        if self._socket is None:
+            self._connect()
+        self._socket.sendall(question.encode() + b"\n")
+        answer = self._stream.readline()
+        assert answer, self._ended()
+        return _bytes_back(json.loads(answer))
+
+    def _connect(self):
+        def attempt():
+            self._socket = socket.socket(socket.AF_UNIX)
+            self._socket.settimeout(120)
+            try:
+                self._socket.connect(self._path)
+                return True
+            except OSError:
+                self._socket.close()
+                assert self._process.poll() is None, self._ended()
+                return False
+
+        wait_until(attempt, lambda: "the program to answer\n" + self.said(), 60)
+        self._stream = self._socket.makefile("rb")
+
+    def windows(self):
+        """All top-level windows, shown or not."""
+        return [_widget(window) for window in self.ask("tree")]
+
+    def sketch(self):
+        """What is on the screen, to be read."""
+        return "\n".join(one.sketch() for one in self.windows() if one["visible"])
+
+    def registry(self, key):
+        """{"id", "type", "name"} of what the main window holds under the key, or None."""
+        return self.ask("registry " + key)
+
+    def registered_rows(self, key):
+        """Rows of a list that is registered under the key, shown or not."""
+        rows = self.ask("rows @" + key)
+        return rows and [row["texts"] for row in rows]
+
+    # The main window's list.
+    def networks(self):
+        """The shown rows, five texts each."""
+        return self.rows("view-press")
+
+    def wait_title(self, text, limit=LIMIT):
+        wait_until(lambda: self.text("title-label") == text,
+                   lambda: f"the title {text!r}; it is {self.text('title-label')!r}", limit)
+
+    def wait_listed(self, limit=LIMIT):
+        """Until a refresh is over and its rows are there."""
+        def listed():
+            window = self.tree()
+            return window.find("title-label")["text"] == IDLE and \
+                window.find("view-press")["sensitive"] and self.networks()
+        wait_until(listed, lambda: "networks\n" + self.sketch(), limit)
+        return self.networks()
+
+    def wait_state(self, row, text, limit=LIMIT):
+        """Until a row's last column shows a text."""
+        def state():
+            rows = self.networks()
+            return rows[row][4] if row < len(rows) else None
+        wait_until(lambda: state() == text, lambda: f"state {text!r}; it is {state()!r}", limit)
+
+    # Dialogs.
+    def dialog(self, title=None, text=None, limit=LIMIT):
+        """The dialog with this title, or with a label that has this text, once it is shown."""
+        def choose(window):
+            return not self._is_main(window) and window["type"] != "GtkTooltip" and \
+                (title is None or window["title"] == title) and \
+                (text is None or any(one.get("text") == text for one in window.walk()
+                                     if one["visible"]))
+        pane = Pane(self, f"dialog {title or text!r}", choose).wait(limit)
+        if self.window_manager:  # and in front, with the keys
+            wait_until(lambda: (pane.now() or {"active": True})["active"] or
+                       self.props(pane.tree())["properties"]["type"] == "popup",
+                       lambda: f"the focus of {pane.description}\n{self.sketch()}", limit)
+        return pane
+
+    def dialogs(self):
+        """Titles and texts of all shown windows but the main one."""
+        return [(one["title"], one.texts()) for one in self.windows()
+                if one["visible"] and not self._is_main(one)]
+
+    # Keys go where the focus is.
+    def key(self, combination):
+        if self.window_manager:
+            wait_until(lambda: any(one["active"] for one in self.windows() if "active" in one),
+                       lambda: f"a window for {combination}\n{self.sketch()}")
+        self.display.key(combination)
+
+    # Its end.
+    def running(self):
+        return self._process.poll() is None
+
+    def wait_end(self, limit=LIMIT):
+        wait_until(lambda: self._process.poll() is not None, "the program to end", limit)
+        return self._process.returncode
+
+    def quit(self, limit=60):
+        """Closes the main window as its title bar does, once the last dialog has gone (the window
+        takes no notice before); gives the exit status."""
+        wait_until(lambda: not any(one["visible"] and one["type"].endswith("Dialog")
+                                   for one in self.windows()), "the dialogs to go", limit)
+        title = self.tree()["title"]
+        self.disconnect()
+        self.display.close_window(title)
+        return self.wait_end(limit)
+
+    def disconnect(self):
+        """Leaves the probe; the next question connects again."""
+        if self._socket is not None:
+            self._stream.close()
+            self._socket.close()
+            self._socket = None

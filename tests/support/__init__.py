@@ -1,0 +1,2 @@
+# SPDX-License-Identifier: MIT
+"""What tests of several kinds share: the formats that the program reads."""
