@@ -1,61 +1,22 @@
-"""The two grammars of a device, read strictly as the program reads them: a reader that shares no
-line with the program or with the commands under test."""
+# SPDX-License-Identifier: MIT
+"""The two grammars of a device, read strictly: no line is longer than the program reads at once."""
 
+import os
 import re
+import sys
 
-KEYWORDS = (b"Address:", b"ESSID:", b"Mode:", b"Frequency:", b"Quality:", b"Encryption key:")
-FIELDS = ("address", "essid", "mode", "frequency", "quality", "key")
-
-
-def value(line, keyword, separator):
-    """The text behind a keyword up to the separator; None when there is none."""
-    position = line.find(keyword)
-    if position < 0:
-        return None
-    text = line[position + len(keyword):].strip(b" \t\n\v\f\r")
-    return text.split(separator)[0] if text else None
+sys.path.insert(0, os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
+from support.grammar import KEYWORDS, SCAN_LINE, read_interfaces, read_scan  # noqa: E402
 
 
 def networks(text):
-    """The networks of a scan as dictionaries, in order."""
-    lines = iter(text.splitlines(keepends=True))
-    found = []
-    for line in lines:
-        if b"Cell" not in line:
-            continue
-        network = dict.fromkeys(FIELDS, b"")
-        used = set()
-        while True:
-            assert len(line) <= 511, line
-            for keyword, field in zip(KEYWORDS, FIELDS):
-                if field in used:
-                    continue
-                text = value(line, keyword, b" " * 8 if field == "essid" else b" ")
-                if text is not None:
-                    used.add(field)
-                    if field == "essid":
-                        text = re.sub(rb'^"', b" ", text)
-                        text = re.sub(rb'"$', b" ", text).strip(b" \t\n\v\f\r")
-                    network[field] = text
-                    break
-            else:
-                if value(line, b"Bit Rates:", b" ") is not None:
-                    break
-            line = next(lines, None)
-            if line is None:
-                break
-        network["lines"] = len(used)
-        found.append(network)
-    return found
+    """The networks of a scan with all their fields and the number of those found, in order."""
+    assert all(len(line) <= SCAN_LINE for line in text.splitlines(keepends=True))
+    return [{**dict.fromkeys(KEYWORDS.values(), b""), **network, "lines": len(network)}
+            for network in read_scan(text)]
 
 
-def interfaces(text):
-    """The names under the header of the kernel's list; None when there is no header."""
-    lines = text.split(b"\n")[:-1]
-    for number, line in enumerate(lines):
-        if line.startswith(b" face"):
-            return [line.split(b":")[0].strip() for line in lines[number + 1:]]
-    return None
+interfaces = read_interfaces
 
 
 def name_bytes(text):
