@@ -1,0 +1,135 @@
+# shellcheck shell=sh
+# SPDX-License-Identifier: MIT
+# How a network stands in wpa_supplicant's configuration: its name and its key arrive there byte
+# for byte. The network is in the caller's variables:
+#   name        its bytes as hexadecimal digits
+#   security    open, wep or wpa
+#   adhoc       yes for a network of equals
+#   key, index, encryption   the key, which of the four WEP keys it is, and open or restricted
+# shellcheck disable=SC2154
+
+# hex TEXT: its bytes as hexadecimal digits. The texts here are names and keys: they go through
+# pipes and shell built-ins, never into another program's arguments.
+hex() {
+    printf '%s' "$1" | od -An -v -tx1 | tr -d ' \n'
+}
+
+# name_hex NAME: the bytes of a name; \xNN, which the list shows for a byte that cannot be shown,
+# stands for that byte.
+name_hex() {
+    printf '%s' "$1" | od -An -v -tx1 | awk '
+    function digit(code) {
+        if (code ~ /^3[0-9]$/)
+            return substr(code, 2)
+        if (code ~ /^[46][1-6]$/)
+            return substr("abcdef", substr(code, 2), 1)
+        return ""
+    }
+    {
+        for (i = 1; i <= NF; i++)
+            byte[n++] = $i
+    }
+    END {
+        for (i = 0; i < n; i++) {
+            high = digit(byte[i + 2])
+            low = digit(byte[i + 3])
+            if (i + 3 < n && byte[i] byte[i + 1] == "5c78" && high != "" && low != "") {
+                printf "%s", high low
+                i += 3
+            } else
+                printf "%s", byte[i]
+        }
+    }'
+}
+
+# Whether TEXT is hexadecimal digits alone.
+is_hex() {
+    case $1 in
+    '' | *[!0-9A-Fa-f]*) return 1 ;;
+    esac
+}
+
+# wep_lines KEY INDEX WORD: the key under its index, and how the station proves that it has it.
+wep_lines() {
+    case ${#1} in
+    5 | 13 | 16) wep_key=$(hex "$1") ;;
+    10 | 26 | 32)
+        is_hex "$1" || return 1
+        wep_key=$1
+        ;;
+    *) return 1 ;;
+    esac
+    printf 'key_mgmt=NONE\nwep_key%d=%s\nwep_tx_keyidx=%d\n' "$2" "$wep_key" "$2"
+    case $3 in
+    restricted) echo 'auth_alg=SHARED' ;;
+    *) echo 'auth_alg=OPEN' ;;
+    esac
+}
+
+# name_bytes: the bytes of the name, and a full stop after them, which keeps a line end at the end.
+name_bytes() {
+    rest=$name
+    while [ -n "$rest" ]; do
+        more=${rest#??}
+        printf '%b' "\\0$(printf '%o' "$((0x${rest%"$more"}))")"
+        rest=$more
+    done
+    printf .
+}
+
+# wpa_lines KEY ADHOC: 64 hexadecimal digits are the key itself, 8 to 63 characters the phrase that
+# it is made from.
+wpa_lines() {
+    phrase=
+    case ${#1} in
+    64)
+        is_hex "$1" || return 1
+        psk=$1
+        management='WPA-PSK WPA-PSK-SHA256'
+        ;;
+    [89] | [1-5][0-9] | 6[0-3])
+        # wpa_supplicant takes the phrase as it stands between the first and the last quotation
+        # mark of the line, and refuses control characters.
+        case $1 in
+        *[[:cntrl:]]*) return 1 ;;
+        esac
+        psk=\"$1\"
+        management='WPA-PSK WPA-PSK-SHA256 SAE'
+        case $1 in
+        *\"*\#*)
+            # Here it would see a comment: it gets the key that the phrase makes under this name.
+            psk=$(name_bytes)
+            psk=$(printf '%s\n' "$1" | wpa_passphrase "${psk%.}" 2>/dev/null)
+            psk=${psk##*psk=}
+            psk=${psk%%[!0-9a-f]*}
+            [ ${#psk} -eq 64 ] || return 1
+            phrase=$(hex "$1")
+            ;;
+        esac
+        ;;
+    *) return 1 ;;
+    esac
+    if [ "$2" = yes ]; then
+        # Among equals only WPA2 is defined.
+        printf 'proto=RSN\nkey_mgmt=WPA-PSK\npairwise=CCMP\ngroup=CCMP\npsk=%s\n' "$psk"
+    else
+        printf 'key_mgmt=%s\nieee80211w=1\npsk=%s\n' "$management" "$psk"
+        [ -z "$phrase" ] || printf 'sae_password=%s\n' "$phrase"
+    fi
+}
+
+# network_block LINE...: the network with these further lines; fails when it cannot have its key.
+network_block() {
+    printf 'network={\nssid=%s\n' "$name"
+    printf '%s\n' "$@"
+    if [ "$adhoc" = yes ]; then
+        # Channel 1 is where the network is made when nobody else has made it yet.
+        printf 'mode=1\nfrequency=2412\n'
+    fi
+    case $security in
+    open) echo 'key_mgmt=NONE' ;;
+    wep) wep_lines "$key" "$((index - 1))" "$encryption" || return 1 ;;
+    wpa) wpa_lines "$key" "$adhoc" || return 1 ;;
+    esac
+    echo '}'
+}
