@@ -122,6 +122,22 @@ static void put_rectangle(GString *out, const char *name, GdkRectangle at)
     g_string_append_printf(out, "[%d, %d, %d, %d]", at.x, at.y, at.width, at.height);
 }
 
+// What it takes to show the widget whole: its request, for a label its text.
+static void put_needs(GString *out, GtkWidget *widget)
+{
+    GtkRequisition needs;
+    gtk_widget_get_requisition(widget, &needs);
+    if (GTK_IS_LABEL(widget)) {
+        gint x, y;
+        gtk_misc_get_padding(GTK_MISC(widget), &x, &y);
+        pango_layout_get_pixel_size(gtk_label_get_layout(GTK_LABEL(widget)), &needs.width,
+                                    &needs.height);
+        needs.width += 2 * x;
+        needs.height += 2 * y;
+    }
+    g_string_append_printf(out, ", \"needs\": [%d, %d]", needs.width, needs.height);
+}
+
 static void put_combo(GString *out, GtkComboBox *combo)
 {
     GtkTreeModel *model = gtk_combo_box_get_model(combo);
@@ -165,7 +181,12 @@ static void put_tree(GString *out, GtkWidget *widget)
     put_flag(out, "focus", gtk_widget_has_focus(widget));
     put_flag(out, "default", gtk_widget_has_default(widget));
     put_rectangle(out, "rect", on_screen(widget));
+    put_needs(out, widget);
     if (GTK_IS_WINDOW(widget)) {
+        GdkRectangle frame = {0, 0, 0, 0};
+        if (gtk_widget_get_mapped(widget))
+            gdk_window_get_frame_extents(gtk_widget_get_window(widget), &frame);
+        put_rectangle(out, "frame", frame);
         put_field(out, "title", gtk_window_get_title(GTK_WINDOW(widget)));
         put_flag(out, "modal", gtk_window_get_modal(GTK_WINDOW(widget)));
         put_flag(out, "active", gtk_window_is_active(GTK_WINDOW(widget)));

@@ -160,11 +160,44 @@ class Pane:
             key, value = ("name", what) if isinstance(what, str) else ("id", what["id"])
             return next((one for one in self.tree().walk() if one[key] == value), None)
 
-        widget = self._in_place(found, lambda widget: widget["rect"],
-                                f"{description or what} to press", limit)
+        def in_place():
+            return self._in_place(found, lambda widget: widget["rect"],
+                                  f"{description or what} to press", limit)
+
+        widget = in_place()
+        if self._scroll_to(found, widget):
+            widget = in_place()
         x, y, width, height = widget["rect"]
         self.app.display.click(x + width // 2, y + height // 2, button, count)
         return widget
+
+    def _scroll_to(self, find, widget):
+        """Turns the wheel over the scroll bars around a widget until its middle is in sight; gives
+        whether there was anything to do."""
+        moved = False
+        child = widget
+        while child is not None:
+            frame = child.parent
+            if child["type"] == "GtkViewport" and frame["type"] == "GtkScrolledWindow":
+                for axis, bar in enumerate(("GtkHScrollbar", "GtkVScrollbar")):
+                    moved |= self._scroll(find, child, frame, axis, bar)
+            child = frame
+        return moved
+
+    def _scroll(self, find, viewport, frame, axis, kind):
+        moved = False
+        while True:
+            rect = find()["rect"]
+            middle = rect[axis] + rect[axis + 2] // 2
+            low, size = viewport["rect"][axis], viewport["rect"][axis + 2]
+            if low < middle < low + size:
+                return moved
+            bar, = [one for one in frame["children"] if one["type"] == kind]
+            assert bar["mapped"], f"{find()['name']} is out of sight, with no {kind} to it"
+            x, y, width, height = bar["rect"]
+            self.app.display.click(x + width // 2, y + height // 2, 5 if middle > low else 4)
+            moved = True
+            wait_until(lambda: find()["rect"] != rect, f"{find()['name']} to come into sight")
 
     def _in_place(self, find, place, what, limit=LIMIT):
         """The widget, once it can be used, its window is in front, and its place is the same twice
@@ -341,6 +374,10 @@ class Program(Pane):
                        self.props(pane.tree())["properties"]["type"] == "popup",
                        lambda: f"the focus of {pane.description}\n{self.sketch()}", limit)
         return pane
+
+    def window(self, identity):
+        """The window with that id in its record."""
+        return Pane(self, f"window {identity}", lambda window: window["id"] == identity)
 
     def dialogs(self):
         """Titles and texts of all shown windows but the main one."""

@@ -4,8 +4,8 @@ its root window."""
 
 import threading
 
-from Xlib import X, XK, display as xdisplay, error
-from Xlib.ext import record, xtest
+from Xlib import X, XK, Xatom, display as xdisplay, error
+from Xlib.ext import randr, record, xtest
 from Xlib.protocol import event
 
 from .wait import wait_until
@@ -88,6 +88,53 @@ class Screen:
         running = self._x.intern_atom("_NET_SUPPORTING_WM_CHECK")
         wait_until(lambda: self.root.get_full_property(running, X.AnyPropertyType),
                    "the window manager did not start")
+
+    def turn(self, width, height):
+        """Gives the screen another size while everything runs; no larger than it was at first."""
+        resources = self.root.xrandr_get_screen_resources()
+        crtc, output = resources.crtcs[0], resources.outputs[0]
+        mode = next((one.id for one in resources.modes
+                     if (one.width, one.height) == (width, height)), None)
+        if mode is None:
+            name = f"{width}x{height}"
+            mode = self.root.xrandr_create_mode(
+                (0, width, height, 0, 0, 0, 0, 0, 0, 0, 0, len(name), 0), name).mode
+            self._x.xrandr_add_output_mode(output, mode)
+
+        def show(mode, outputs):
+            time = self.root.xrandr_get_screen_resources().config_timestamp
+            self._x.xrandr_set_crtc_config(crtc, time, 0, 0, mode, randr.Rotate_0, outputs)
+
+        show(0, [])
+        self.root.xrandr_set_screen_size(width, height, width * 254 // 960, height * 254 // 960)
+        show(mode, [output])
+        self._x.sync()
+        self.width, self.height = width, height
+
+    def set_dpi(self, dpi):
+        """Dots an inch, by which programs that start from now on choose the size of their type."""
+        self.root.change_property(Xatom.RESOURCE_MANAGER, Xatom.STRING, 8,
+                                  f"Xft.dpi: {dpi}\n".encode())
+        self._x.sync()
+
+    def panel(self, height):
+        """A bar along the lower edge that the window manager keeps free of windows."""
+        bar = self.root.create_window(0, self.height - height, self.width, height, 0,
+                                      X.CopyFromParent)
+        bar.change_property(self._x.intern_atom("_NET_WM_WINDOW_TYPE"), Xatom.ATOM, 32,
+                            [self._x.intern_atom("_NET_WM_WINDOW_TYPE_DOCK")])
+        bar.change_property(self._x.intern_atom("_NET_WM_STRUT"), Xatom.CARDINAL, 32,
+                            [0, 0, 0, height])
+        bar.map()
+        self._x.sync()
+        wait_until(lambda: self.work_area()[3] <= self.height - height, "the panel's place")
+        return bar
+
+    def work_area(self):
+        """[x, y, width, height] of what windows may cover."""
+        area = self.root.get_full_property(self._x.intern_atom("_NET_WORKAREA"),
+                                           X.AnyPropertyType)
+        return list(area.value[:4]) if area else [0, 0, self.width, self.height]
 
     # Pointer and keys.
     def move(self, x, y):
