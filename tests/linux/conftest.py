@@ -1,0 +1,39 @@
+# SPDX-License-Identifier: MIT
+"""Where the tests of the device commands run: every worker in namespaces of its own (mounts,
+network, processes), so that the commands keep their real paths and the machine stays as it is."""
+
+import os
+import sys
+
+import pytest
+
+sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
+pytest.register_assert_rewrite("machine")
+
+import machine  # noqa: E402
+
+
+@pytest.hookimpl(tryfirst=True)
+def pytest_cmdline_main(config):
+    if hasattr(config, "workerinput") or config.option.collectonly:
+        return
+    user = "" if os.geteuid() == 0 else "-r"
+    place = (f"unshare {user} -mnpf --mount-proc --kill-child --propagation private "
+             f"{sys.executable}")
+    workers = config.option.numprocesses
+    config.option.tx = [f"popen//python={place}"] * (workers if isinstance(workers, int) else 1)
+    config.option.numprocesses = None
+    config.option.dist = "load"
+
+
+@pytest.fixture(scope="session", autouse=True)
+def scratch_machine():
+    machine.set_up()
+    yield
+    machine.tear_down()
+
+
+@pytest.fixture(autouse=True)
+def fresh_machine():
+    """Every test begins with no process, no interface and no file of the one before."""
+    machine.clean()

@@ -1,0 +1,204 @@
+# SPDX-License-Identifier: MIT
+"""iwlist of the device: scans in the board's form, everything else the real tool's."""
+
+import glob
+import os
+import re
+import subprocess
+
+import pytest
+
+import board
+import machine
+from machine import calls, choose, note, path_line, read, run, sh, write
+from scans import (address_of, answer, assert_form, assert_names, convert, ends_like_an_escape,
+                   hostile_names, numbered)
+
+SCANS = sorted(os.path.basename(path)
+               for path in glob.glob(f"{machine.SAMPLES}/iwlist-scan-linux-*.txt"))
+
+# What was on the air when the samples were taken.
+AIR = {
+    b"02:00:00:00:01:00": b"cafe", b"02:00:00:00:01:01": b"", b"02:00:00:00:01:02": b"",
+    b"02:00:00:00:01:03": "Café ☕".encode(), b"02:00:00:00:01:04": b"a\"b$(id)",
+    b"02:00:00:00:01:05": b"eight        blanks", b"02:00:00:00:01:06": b" blank at ends ",
+    b"02:00:00:00:01:07": b"Cell 99 - Address: x", b"02:00:00:00:02:00": b"home net",
+    b"02:00:00:00:02:01": b"mixed", b"02:00:00:00:02:02": b"sae", b"02:00:00:00:03:00": b"old wep",
+}
+
+
+@pytest.fixture(autouse=True)
+def real_tool_is_a_stub():
+    choose("iwlist")
+
+
+@pytest.mark.parametrize("awk", machine.AWKS)
+@pytest.mark.parametrize("sample", SCANS)
+def test_sample_in_our_form(sample, awk):
+    out = convert(read(f"{machine.SAMPLES}/{sample}"), machine.awk_directory(awk))
+    assert out == read(f"{machine.EXPECTED}/{sample}")
+    assert_form(out)
+
+
+@pytest.mark.parametrize("sample", SCANS)
+def test_sample_shows_what_was_on_the_air(sample):
+    found = board.networks(read(f"{machine.EXPECTED}/{sample}"))
+    air = dict(AIR)
+    if "associated" in sample or "hidden-probed" in sample:
+        air[b"02:00:00:00:01:01"] = b"hidden one"
+    names = {cell["address"]: board.name_bytes(cell["essid"]) for cell in found}
+    assert len(names) == len(found), "an access point is listed twice"
+    assert {address: names.get(address) for address in air} == air
+    keys = {cell["address"]: cell["key"] for cell in found if cell["address"] in AIR}
+    assert keys == {address: b"on" if address[12:14] in (b"02", b"03") else b"off"
+                    for address in keys}
+    modes = {board.name_bytes(cell["essid"]): cell["mode"] for cell in found}
+    if b"adhoc wep" in read(f"{machine.SAMPLES}/{sample}"):
+        assert modes[b"adhoc wep"] == b"Ad-Hoc"
+    for cell in found:
+        assert cell["lines"] == 6
+        assert re.fullmatch(rb"\d+/70", cell["quality"])
+        assert re.fullmatch(rb"2\.4\d+", cell["frequency"])
+
+
+def test_sample_of_163_networks_is_whole():
+    out = read(f"{machine.EXPECTED}/iwlist-scan-linux-6.1-hwsim-163-networks.txt")
+    assert len(board.networks(out)) == 163
+
+
+@pytest.mark.parametrize("awk", machine.AWKS)
+def test_every_name_comes_back(awk):
+    names = hostile_names()
+    assert_names(convert(answer(numbered(names)), machine.awk_directory(awk)), names)
+
+
+def test_names_without_elements():
+    names = [name for name in hostile_names() if not ends_like_an_escape(name)]
+    assert_names(convert(answer(numbered(names), elements=False)), names)
+
+
+@pytest.mark.parametrize("name, text", [
+    ("Ünïcode ✓".encode(), "Ünïcode ✓".encode()), (b"\xff", rb"\xFF"), (b"\xc3x", rb"\xC3x"),
+    (b"a\nb", rb"a\x0Ab"), (b"\xc2\x85", rb"\xC2\x85"), (b"\xed\xa0\x80", rb"\xED\xA0\x80"),
+    (b"\xe2\x80\xae", rb"\xE2\x80\xAE"), (b"\\x41", rb"\x5Cx41"), (b"\\x4g", rb"\x4g"),
+    (b"\\", b"\\"), (b" a ", rb"\x20a\x20"), (b"a  b", b"a  b"), (b"\0\0\0", b""), (b"", b""),
+    (b"a        b", rb"a       \x20b"), (b"\xf0\x9f\x98\x80", b"\xf0\x9f\x98\x80"),
+    (b"\xc0\xaf", rb"\xC0\xAF"), (b"\xe2\x98", rb"\xE2\x98")])
+def test_text_of_a_name(name, text):
+    assert board.networks(convert(answer([(address_of(1), name)])))[0]["essid"] == text
+
+
+@pytest.mark.parametrize("elements", [True, False])
+def test_names_through_the_real_tool(elements):
+    """It, not we, says how names are printed."""
+    choose()
+    shim = os.path.join(machine.ROOT, "scan_shim.so")
+    sh("cc", "-Wall", "-Wextra", "-Werror", "-shared", "-fPIC", "-o", shim,
+       f"{machine.HERE}/scan_shim.c", "-ldl")
+    names = hostile_names()[:250]
+    if not elements:
+        names = [name for name in names if not ends_like_an_escape(name)]
+    write(f"{machine.ROOT}/names", b"".join(name.hex().encode() + b"\n" for name in names))
+    environment = {"LD_PRELOAD": shim, "SCAN_NETWORKS": f"{machine.ROOT}/names"}
+    if elements:
+        environment["SCAN_ELEMENTS"] = "1"
+    status, out, err = run("iwlist", "lo", "scan", more_environment=environment)
+    assert (status, err) == (0, b"")
+    assert_names(out, names)
+
+
+def test_failed_scan_of_the_real_tool():
+    choose()
+    assert run("iwlist", "lo", "scan") == (
+        255, b"", read(f"{machine.SAMPLES}/iwlist-scan-error-not-wireless.txt"))
+
+
+ONE, TWO, THREE = map(address_of, (1, 2, 3))
+
+
+@pytest.mark.parametrize("sent, shown", [
+    ([(ONE, b""), (TWO, b"b"), (ONE, b"a")], [(ONE, b"a"), (TWO, b"b")]),  # hidden, then found
+    ([(ONE, b"a"), (TWO, b"b"), (ONE, b"")], [(ONE, b"a"), (TWO, b"b")]),
+    ([(ONE, b"\0\0"), (ONE, b"a")], [(ONE, b"a")]),
+    ([(ONE, b""), (ONE, b"\0")], [(ONE, b"")]),
+    ([(ONE, b"a"), (ONE, b"a")], [(ONE, b"a")]),
+    ([(ONE, b"a"), (ONE, b"b")], [(ONE, b"a"), (ONE, b"b")]),  # two names of one access point
+    ([(ONE, b""), (ONE, b"a"), (THREE, b""), (ONE, b"b")],
+     [(ONE, b"a"), (THREE, b""), (ONE, b"b")]),
+    ([(ONE, b"a"), (TWO, b"a")], [(ONE, b"a"), (TWO, b"a")])])
+def test_network_that_is_there_twice(sent, shown):
+    assert [(cell["address"], cell["essid"])
+            for cell in board.networks(convert(answer(sent)))] == shown
+
+
+HEAD = b"x     Scan completed :\n          Cell 01 - Address: 02:00:00:00:00:01\n"
+MARGIN = b" " * 20
+
+
+def test_no_results():
+    assert convert(b"wlan0     No scan results\n\n") == b"wlan0     No scan results\n\n"
+
+
+def test_lines_of_an_older_driver():
+    found = board.networks(convert(
+        HEAD + MARGIN + b"ESSID:off/any/hidden\n" +
+        MARGIN + b"Quality:12/70  Signal level:-60 dBm\n" +
+        MARGIN + b"Encryption key:1234-5678-90 [2]   Security mode:open\n"))
+    assert (found[0]["essid"], found[0]["quality"], found[0]["key"]) == (b"", b"12/70", b"on")
+
+
+def test_network_without_lines_closes():
+    found = board.networks(convert(
+        HEAD + HEAD[-45:] + MARGIN + b"ESSID:\"Mode: x\" [2]\n" + MARGIN + b"Bit Rates:\n"))
+    assert len(found) == 1
+
+
+def test_interface_of_a_confusing_name():
+    out = convert(HEAD.replace(b"x  ", b"Cell") + MARGIN + b"ESSID:\"a\"\n")
+    assert len(board.networks(out)) == 1
+
+
+@pytest.mark.parametrize("name", ["interface-down", "no-device", "not-wireless"])
+def test_error_is_passed_on(name):
+    text = read(f"{machine.SAMPLES}/iwlist-scan-error-{name}.txt")
+    note("scan-error", text)
+    assert run("iwlist", "wlan0", "scan") == (255, b"", text)
+    assert len(calls("iwlist")) == 1
+
+
+def test_another_scan_is_waited_for():
+    note("busy", read(f"{machine.SAMPLES}/iwlist-scan-error-busy.txt"))
+    note("scan", answer([(address_of(1), b"cafe")]))
+    status, out, err = run("iwlist", "wlan0", "scan", "essid", "a b")
+    assert (status, err, len(board.networks(out))) == (0, b"", 1)
+    assert calls("iwlist")[1:] == [[b"iwlist", b"wlan0", b"scan", b"essid", b"a b", b"last"]]
+    note("scan-error", "wlan0     Failed to read scan data : Resource temporarily unavailable\n\n")
+    assert run("iwlist", "wlan0", "scan") == (255, b"", read(f"{machine.LOG}/scan-error"))
+
+
+def test_other_questions_are_passed_on():
+    note("scan", "as it is\n")
+    assert run("iwlist", "wlan0", "freq")[:2] == (0, b"as it is\n")
+    assert calls("iwlist") == [[b"iwlist", b"wlan0", b"freq"]]
+
+
+def test_scan_options_are_passed_on():
+    note("scan", answer([(address_of(1), b"a")]))
+    status, out, _ = run("iwlist", "wlan0", "scanning", "essid", "a b $x")
+    assert (status, len(board.networks(out))) == (0, 1)
+    assert calls("iwlist") == [[b"iwlist", b"wlan0", b"scanning", b"essid", b"a b $x"]]
+
+
+def test_own_directory_is_skipped_however_it_is_written():
+    note("scan", answer([(address_of(1), b"a")]))
+    device = machine.DEVICE
+    status, out, _ = run("iwlist", "wlan0", "scan",
+                         path=path_line(device, f"{device}/.", f"{device}/man/.."))
+    assert (status, len(board.networks(out))) == (0, 1)
+
+
+def test_found_on_path():
+    note("scan", answer([(address_of(1), b"a")]))
+    out = subprocess.run("iwlist wlan0 scan", shell=True, stdout=subprocess.PIPE, check=True,
+                         env=machine.environment(machine.DEVICE)).stdout
+    assert len(board.networks(out)) == 1

@@ -1,0 +1,66 @@
+# SPDX-License-Identifier: MIT
+"""What the real wpa_supplicant reads out of the files that iwset gives it."""
+
+import os
+import random
+import subprocess
+
+import pytest
+
+import joining
+import machine
+from joining import iwset
+from machine import STATE, read, sh, wait_for, write
+
+
+def read_back(field, *words, **options):
+    """A field of the network, as the supplicant tells it."""
+    joining.set_up()
+    iwset(*words, **options)
+    sh("umount", "/sys/class/net")
+    if not os.path.exists("/sys/class/net/parser0"):
+        sh("ip", "link", "add", "parser0", "type", "veth", "peer", "name", "parser1")
+    control = f"{machine.ROOT}/control"
+    path = f"{machine.ROOT}/real.conf"
+    write(path, read(f"{machine.LOG}/conf").replace(STATE.encode(), machine.ROOT.encode()))
+    process = subprocess.Popen(["wpa_supplicant", "-i", "parser0", "-D", "wired", "-c", path],
+                               stdout=subprocess.PIPE, stderr=subprocess.STDOUT)
+    try:
+        assert wait_for(lambda: os.path.exists(f"{control}/parser0") or process.poll() is not None)
+        assert process.poll() is None, process.stdout.read()
+        return subprocess.run(
+            ["wpa_cli", "-p", control, "-i", "parser0", "get_network", "0", field],
+            stdout=subprocess.PIPE, check=True).stdout.strip()
+    finally:
+        process.terminate()
+        process.wait(20)
+
+
+@pytest.mark.parametrize("name", [b"cafe", b"a\"b$(id)", b"Caf\xc3\xa9", b"\n\x01", b"#",
+                                  b"x" * 32])
+def test_name(name):
+    shown = read_back("ssid", name)
+    assert name == (shown[1:-1] if shown[:1] == b'"' else bytes.fromhex(shown.decode()))
+
+
+def phrases():
+    generator = random.Random(11)
+    return ["".join(generator.choice("\"#\\a '=%$") for _ in range(generator.randint(8, 20)))
+            for _ in range(25)]
+
+
+@pytest.mark.parametrize("key", ["12345678", "a\"b#c $(id)", "\"quoted\"", "ends in \\",
+                                 "Löcher im Käse", "0" * 64, *phrases()])
+def test_wpa_key(key):
+    assert read_back("psk", "x", key, "open", wpa=True) == b"*"
+
+
+@pytest.mark.parametrize("field, words, options, value", [
+    ("key_mgmt", ("12345678", "open"), {"wpa": True}, b"WPA-PSK WPA-PSK-SHA256 SAE"),
+    ("wep_tx_keyidx", ("abcde", "open"), {"index": "[3]"}, b"2"),
+    ("wep_key2", ("abcde", "open"), {"index": "[3]"}, b"*"),
+    ("auth_alg", ("abcde", "restricted"), {}, b"SHARED"),
+    ("mode", (), {"mode": "Ad-Hoc"}, b"1"),
+    ("proto", ("12345678", "open"), {"mode": "Ad-Hoc", "wpa": True}, b"RSN")])
+def test_field(field, words, options, value):
+    assert read_back(field, "x", *words, **options) == value
