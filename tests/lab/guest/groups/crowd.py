@@ -1,0 +1,46 @@
+"""More networks than the list holds."""
+
+import re
+
+import air
+import window as w
+from air import network, run, until
+from steps import check, connected_to, press_connect, same
+
+
+def prepare():
+    air.radios(7)
+    number = 0
+    for radio, channel, count in ((1, 1, 33), (2, 4, 33), (3, 6, 33), (4, 9, 33), (5, 11, 31)):
+        names = [b"Network %03d" % (number + one) for one in range(count)]
+        number += count
+        air.access_point(radio, channel, [network(name, net=1 if name.endswith(b"000") else None)
+                                          for name in names], beacon=200)
+    air.addresses(1)
+    w.begin()
+    w.idle()
+
+
+def of_163_networks_128_are_listed():
+    found = until(lambda: run("iwlist", "wlan0", "scan", check=False).count("ESSID:") >= 163,
+                  "163 networks are on the air", 60)
+    check(found, "no networks")
+    w.refresh()
+    listed = [one[0] for one in w.rows()]
+    same(len(listed), 128, "the number of rows")
+    same(len(set(listed)), 128, "the number of different rows")
+    check(all(re.fullmatch(r"Network \d{3}", one) for one in listed), f"the rows are {listed}")
+    # All of them can be scrolled to: the list measures its rows little by little.
+    until(lambda: w.widget("view-press")["rect"][3] > 128 * 12, "the list is as high as its rows")
+    w.photograph("crowd")
+
+
+def one_of_them_is_joined():
+    press_connect("Network 000")
+    connected_to(1)
+
+
+SCENARIOS = [
+    of_163_networks_128_are_listed,
+    one_of_them_is_joined,
+]
