@@ -7,6 +7,8 @@
 
 #include <glib.h>
 
+constexpr char SETTINGS_FILE[] = "/etc/wireless.conf";
+
 // Writes the settings of wifi_interface[0] and the static_ globals. FALSE when they could not be
 // stored; the old file stands then and standard error has the cause.
 gboolean save_basic_setting_to_file(const gchar *file);

@@ -7,6 +7,8 @@
 
 #include <glib.h>
 
+constexpr char USER_FILE[] = "/etc/wireless-user.conf";
+
 // Writes the user_cell_count preferred networks. FALSE when they could not be stored; the old file
 // stands then and standard error has the cause.
 gboolean save_preferred_network_to_file(const gchar *file);

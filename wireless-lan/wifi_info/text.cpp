@@ -30,6 +30,11 @@ void copy_field(char *field, gsize size, const char *text)
     field[length] = '\0';
 }
 
+gchar *displayable(const char *text)
+{
+    return g_utf8_make_valid(text, -1);
+}
+
 void log_critical(const char *function, const char *expression)
 {
     g_return_if_fail_warning(G_LOG_DOMAIN, function, expression);

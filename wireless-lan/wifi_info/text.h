@@ -11,6 +11,9 @@
 // character, always NUL-terminated. `text` may be NULL (an empty field) or lie inside the field.
 void copy_field(char *field, gsize size, const char *text);
 
+// `text` as valid UTF-8 for what GTK draws: the bytes that are none become U+FFFD. g_free it.
+gchar *displayable(const char *text);
+
 // Logs GLib's failed-precondition message with a plain function name and the literal expression;
 // g_return_if_fail of C++ would log the whole signature.
 void log_critical(const char *function, const char *expression);

@@ -3,7 +3,6 @@
 #include <glib/gi18n.h>
 
 #include "base/state.h"
-#include "base/widgets.h"
 #include "wifi.h"
 #include "wifi_info/text.h"
 

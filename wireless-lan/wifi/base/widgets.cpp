@@ -58,11 +58,6 @@ void set_connect_label(const gchar *stock)
         gtk_button_set_label(GTK_BUTTON(button), stock);
 }
 
-gboolean is_associated(const char *ap_address)
-{
-    return ap_address[0] != '\0' && strcmp(ap_address, "00:00:00:00:00:00") != 0;
-}
-
 static void run_message(GtkWidget *parent, GtkDialogFlags flags, GtkButtonsType buttons,
                         const gchar *message)
 {
@@ -124,11 +119,6 @@ GtkWidget *create_titled_frame(const gchar *title, guint border)
     gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
     gtk_container_set_border_width(GTK_CONTAINER(frame), border);
     return frame;
-}
-
-gchar *displayable(const char *text)
-{
-    return g_utf8_make_valid(text, -1);
 }
 
 const gchar *clist_text(GtkWidget *clist, gint row, gint column)

@@ -25,9 +25,6 @@ void set_title_label(const gchar *text);
 // Sets the label of the Connect button to a stock id; skipped while it does not exist.
 void set_connect_label(const gchar *stock);
 
-// TRUE when an access point address is neither empty nor all zeros.
-gboolean is_associated(const char *ap_address);
-
 // Runs a modal information box with one OK button over `parent` (may be NULL) until it is answered.
 void show_message_box(GtkWidget *parent, const gchar *message);
 
@@ -48,9 +45,6 @@ void set_active_number(GtkWidget *combo, const char *number);
 
 // The frame of a dialog: etched out, its title a little below the line, `border` pixels around it.
 GtkWidget *create_titled_frame(const gchar *title, guint border);
-
-// `text` as valid UTF-8 for what GTK draws: the bytes that are none become U+FFFD. g_free it.
-gchar *displayable(const char *text);
 
 // A row's text of a column list, "" when the cell has none. The list owns it.
 const gchar *clist_text(GtkWidget *clist, gint row, gint column);

@@ -59,6 +59,11 @@ void get_ap_mac()
     fprintf(stderr, "WIRELESS-LAN-DEBUG: Detect Linked Acess Pointer:%s\n", Link_AP_MAC);
 }
 
+gboolean is_associated(const char *ap_address)
+{
+    return ap_address[0] != '\0' && strcmp(ap_address, "00:00:00:00:00:00") != 0;
+}
+
 gboolean address_valid(WIFI_INTERFACE *iface)
 {
     struct ifreq request;

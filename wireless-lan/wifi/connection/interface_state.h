@@ -3,11 +3,16 @@
 #ifndef WIFI_CONNECTION_INTERFACE_STATE_H
 #define WIFI_CONNECTION_INTERFACE_STATE_H
 
+#include <glib.h>
+
 #include "wifi.h"
 
 // Reads the access point of the first interface into Link_AP_MAC with SIOCGIWAP (linux/wireless.h);
 // it stays empty when the request fails.
 void get_ap_mac();
+
+// TRUE when an access point address is neither empty nor all zeros.
+gboolean is_associated(const char *ap_address);
 
 // TRUE when the interface holds an IPv4 address (SIOCGIFADDR), whatever it is. NULL gives FALSE.
 gboolean address_valid(WIFI_INTERFACE *iface);

@@ -8,6 +8,7 @@
 
 #include "base/widgets.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
 // The longest text that a record keeps.
 constexpr gint MAX_TEXT = sizeof(WIFI_CELL::alias) - 1;

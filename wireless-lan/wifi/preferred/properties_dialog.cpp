@@ -8,6 +8,7 @@
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
 static const network_form &form = properties_form;
 

@@ -6,7 +6,6 @@
 
 #include <gtk/gtk.h>
 
-constexpr char USER_FILE[] = "/etc/wireless-user.conf";
 constexpr char FRONT_KEY[] = "user_cell_list_front";
 constexpr char BACKEND_KEY[] = "user_cell_list_backend";
 

@@ -7,8 +7,6 @@
 
 #include "wifi.h"
 
-constexpr char SETTINGS_FILE[] = "/etc/wireless.conf";
-
 // One address of static addressing: its row in the dialog and the two places that keep its text.
 struct address_setting {
     const char *prefix; // of the entry's key, and the entry's widget name

@@ -12,6 +12,7 @@
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
 #include "wifi_info/interfaces.h"
+#include "wifi_info/text.h"
 
 static GtkTooltips *tooltips = nullptr; // one object for every opening
 

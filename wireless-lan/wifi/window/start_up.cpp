@@ -4,7 +4,6 @@
 
 #include "base/state.h"
 #include "preferred/store.h"
-#include "settings/apply.h"
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
 #include "wifi_info/interfaces.h"
