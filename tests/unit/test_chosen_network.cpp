@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "base/state.h"
-#include "connection/monitor.h"
+#include "connection/chosen_network.h"
 #include "wifi.h"
 
 struct ChosenNetwork : testing::Test {

@@ -10,6 +10,7 @@
 #include "base/state.h"
 #include "base/widgets.h"
 #include "connection/add_to_preferred.h"
+#include "connection/chosen_network.h"
 #include "connection/commands.h"
 #include "connection/encrypted_dialog.h"
 #include "connection/monitor.h"
