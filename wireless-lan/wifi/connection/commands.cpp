@@ -12,12 +12,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <glib/gi18n.h>
-
-#include "base/desktop.h"
-#include "base/network_list.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "wifi.h"
 #include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
@@ -140,23 +135,14 @@ gboolean require_ip_address()
     return FALSE;
 }
 
-gboolean do_disconnect(gpointer)
+void leave_network()
 {
     const WIFI_INTERFACE *iface = first_interface();
 
-    if (iface != nullptr && interface_usable(iface->name, "leaving the network")) {
-        g_autofree gchar *command = g_strdup_printf("/sbin/lnk-ifdown %s", iface->name);
+    if (iface == nullptr || !interface_usable(iface->name, "leaving the network"))
+        return;
 
-        run_command(command);
-    }
-    send_status_to_desktop(STATUS_DISCONNECTED);
-    review_tree_vanpro(_("Disconnect"));
+    g_autofree gchar *command = g_strdup_printf("/sbin/lnk-ifdown %s", iface->name);
 
-    WIFI_CELL *cell = scanned_cell(connect_index);
-
-    if (cell != nullptr)
-        cell->linkstate = 2;
-    set_connect_label(GTK_STOCK_CONNECT);
-    connect_index = -1;
-    return FALSE;
+    run_command(command);
 }

@@ -30,7 +30,7 @@ void apply_configuration();
 // Starts "/sbin/lnk-ifup" for the first interface, detached: nobody's child. Always FALSE.
 gboolean require_ip_address();
 
-// One-shot timer: leaves the network. Always FALSE.
-gboolean do_disconnect(gpointer data);
+// Runs "/sbin/lnk-ifdown" for the first interface and waits for it.
+void leave_network();
 
 #endif

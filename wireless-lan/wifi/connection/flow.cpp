@@ -22,6 +22,40 @@
 // Long enough for the new status to be drawn before the commands block the window.
 static const guint COMMAND_DELAY_MS = 100;
 
+// One-shot timer: takes up the network that `data` (a WIFI_CELL) is a copy of, or with NULL the one
+// at connect_index, applies it and starts the link poller. A network that is gone ends the connect
+// and gives the controls back. Always FALSE.
+static gboolean do_connect(gpointer data)
+{
+    const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
+
+    if (chosen != nullptr && !take_up_network(chosen)) {
+        fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
+        set_title_label(_("Wireless network selection"));
+        give_controls_back();
+        return FALSE;
+    }
+    apply_configuration();
+    g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
+    return FALSE;
+}
+
+// One-shot timer: leaves the network. Always FALSE.
+static gboolean do_disconnect(gpointer)
+{
+    leave_network();
+    send_status_to_desktop(STATUS_DISCONNECTED);
+    review_tree_vanpro(_("Disconnect"));
+
+    WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (cell != nullptr)
+        cell->linkstate = 2;
+    set_connect_label(GTK_STOCK_CONNECT);
+    connect_index = -1;
+    return FALSE;
+}
+
 static void start_connect(const WIFI_CELL *chosen)
 {
     WIFI_CELL *copy = g_new(WIFI_CELL, 1);

@@ -10,7 +10,6 @@
 #include "base/network_list.h"
 #include "base/state.h"
 #include "base/widgets.h"
-#include "connection/chosen_network.h"
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "wifi.h"
@@ -38,8 +37,7 @@ static void show_address()
     review_tree_vanpro(status);
 }
 
-// The end of every chain that reached an access point.
-static void give_controls_back()
+void give_controls_back()
 {
     connect_button_sensitive(TRUE);
     doubleclick = TRUE;
@@ -123,20 +121,5 @@ gboolean detect_network_link_state(gpointer)
         return TRUE;
     link_count = 0;
     give_up_link();
-    return FALSE;
-}
-
-gboolean do_connect(gpointer data)
-{
-    const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
-
-    if (chosen != nullptr && !take_up_network(chosen)) {
-        fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
-        set_title_label(_("Wireless network selection"));
-        give_controls_back();
-        return FALSE;
-    }
-    apply_configuration();
-    g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
     return FALSE;
 }

@@ -12,15 +12,13 @@ constexpr guint POLL_MS = 2000;
 // interface is missing.
 void connect_button_sensitive(gboolean flags);
 
+// Gives the controls back at the end of a chain: a double click may connect again too.
+void give_controls_back();
+
 // Timer: waits for an access point, 21 polls at most, then requires an address and hands over.
 gboolean detect_network_link_state(gpointer data);
 
 // Timer: waits for an address, 21 polls at most.
 gboolean detect_network_interface_state(gpointer data);
-
-// One-shot timer: takes up the network that `data` (a WIFI_CELL) is a copy of, or with NULL the one
-// at connect_index, applies it and starts the link poller. A network that is gone ends the connect
-// and gives the controls back. Always FALSE.
-gboolean do_connect(gpointer data);
 
 #endif
