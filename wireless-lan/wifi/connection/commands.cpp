@@ -2,21 +2,16 @@
 
 #include <cerrno>
 #include <cstdio>
-#include <cstring>
 
-#include <net/if.h>
-#include <netinet/in.h>
-#include <sys/ioctl.h>
-#include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include "base/state.h"
+#include "connection/interface_state.h"
 #include "wifi.h"
 #include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
-#include "wifi_info/text.h"
 
 static const char ESSID_FILE[] = "/tmp/essid_tmp";
 static const char KEY_FILE[] = "/tmp/key_tmp";
@@ -59,29 +54,6 @@ void leave_text_for_scripts(const char *text, const char *path, guint mode)
     g_autofree gchar *command = echo_command(text, path);
 
     run_command(command);
-}
-
-// Sets the interface's address to 0.0.0.0, so that the one of the former network is not taken for
-// an answer of the new one.
-static void clear_address(const char *name)
-{
-    const int fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
-    struct ifreq request = {};
-
-    if (fd < 0)
-        return;
-    copy_field(request.ifr_name, sizeof request.ifr_name, name);
-    if (ioctl(fd, SIOCGIFADDR, &request) != 0) {
-        perror("ioctl");
-    } else {
-        struct sockaddr_in address;
-
-        memcpy(&address, &request.ifr_addr, sizeof address);
-        address.sin_addr.s_addr = htonl(INADDR_ANY);
-        memcpy(&request.ifr_addr, &address, sizeof address);
-        ioctl(fd, SIOCSIFADDR, &request);
-    }
-    close(fd);
 }
 
 void apply_configuration()

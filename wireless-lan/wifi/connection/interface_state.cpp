@@ -18,21 +18,27 @@
 #include "wifi.h"
 #include "wifi_info/text.h"
 
-static gboolean request_address(const char *name, struct ifreq *request)
+// Puts a request for the interface that it names to the kernel. FALSE: errno says why.
+static gboolean ask_kernel(unsigned long code, struct ifreq *request)
 {
     const int fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
 
-    memset(request, 0, sizeof *request);
-    copy_field(request->ifr_name, sizeof request->ifr_name, name);
     if (fd < 0)
         return FALSE;
 
-    const gboolean answered = ioctl(fd, SIOCGIFADDR, request) == 0;
+    const gboolean answered = ioctl(fd, code, request) == 0;
     const int reason = errno;
 
     close(fd);
     errno = reason;
     return answered;
+}
+
+static gboolean request_address(const char *name, struct ifreq *request)
+{
+    memset(request, 0, sizeof *request);
+    copy_field(request->ifr_name, sizeof request->ifr_name, name);
+    return ask_kernel(SIOCGIFADDR, request);
 }
 
 void get_ap_mac()
@@ -86,6 +92,23 @@ void get_interface_statistics_data(WIFI_INTERFACE *iface)
     memcpy(&address, &request.ifr_addr, sizeof address);
     copy_field(iface->address, sizeof iface->address, inet_ntoa(address.sin_addr));
     fprintf(stderr, "WIRELESS-LAN-DEBUG: address:%s\n", iface->address);
+}
+
+void clear_address(const char *name)
+{
+    struct ifreq request;
+
+    if (!request_address(name, &request)) {
+        perror("ioctl");
+        return;
+    }
+
+    struct sockaddr_in address;
+
+    memcpy(&address, &request.ifr_addr, sizeof address);
+    address.sin_addr.s_addr = htonl(INADDR_ANY);
+    memcpy(&request.ifr_addr, &address, sizeof address);
+    ask_kernel(SIOCSIFADDR, &request);
 }
 
 static void print_statics(char *values)

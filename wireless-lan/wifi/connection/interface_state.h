@@ -1,4 +1,5 @@
-// What the kernel says of an interface: its address, its access point, its link statistics.
+// What the kernel says of an interface, and what it is told: its address, its access point, its
+// link statistics.
 
 #ifndef WIFI_CONNECTION_INTERFACE_STATE_H
 #define WIFI_CONNECTION_INTERFACE_STATE_H
@@ -19,6 +20,10 @@ gboolean address_valid(WIFI_INTERFACE *iface);
 
 // Reads the interface's IPv4 address into its `address`, which is emptied when it has none.
 void get_interface_statistics_data(WIFI_INTERFACE *iface);
+
+// Sets the IPv4 address of the interface `name` to 0.0.0.0, so that the one of the former network
+// is not taken for an answer of the new one.
+void clear_address(const char *name);
 
 // Prints the interface's line of /proc/net/wireless to standard error; a diagnostic.
 void get_network_statics(WIFI_INTERFACE *iface);
