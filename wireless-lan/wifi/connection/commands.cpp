@@ -82,6 +82,28 @@ void apply_configuration()
     run_command(command);
 }
 
+void host_network(const WIFI_INTERFACE *iface)
+{
+    const WIFI_CELL *group = &iface->wifi_group;
+
+    if (!interface_usable(iface->name, "hosting the Ad-Hoc network"))
+        return;
+
+    g_autofree gchar *up = g_strdup_printf("ifconfig %s up", iface->name);
+    g_autofree gchar *essid = shell_escape(group->essid);
+    // The device hosts without a key; the group's key is only stored.
+    g_autofree gchar *iwset =
+        g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
+                        iface->name, essid, "Ad-Hoc", "off", encryption_word(group->encmode));
+    g_autofree gchar *echo = echo_command(group->essid, ESSID_FILE);
+
+    run_command(up);
+    printf("essid_buf = %s \n", echo);
+    leave_text_for_scripts(group->essid, ESSID_FILE, 0666);
+    printf("cmd=%s\r\n", iwset);
+    run_command(iwset);
+}
+
 gboolean require_ip_address()
 {
     const WIFI_INTERFACE *iface = first_interface();

@@ -27,6 +27,10 @@ void leave_text_for_scripts(const char *text, const char *path, guint mode);
 // an interface or a network.
 void apply_configuration();
 
+// Brings `iface` up, leaves the name of its hosted network in /tmp for the device's scripts and
+// runs /sbin/iwset on it.
+void host_network(const WIFI_INTERFACE *iface);
+
 // Starts "/sbin/lnk-ifup" for the first interface, detached: nobody's child. Always FALSE.
 gboolean require_ip_address();
 

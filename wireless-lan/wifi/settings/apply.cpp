@@ -16,7 +16,6 @@
 #include "connection/monitor.h"
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
-#include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
@@ -88,28 +87,6 @@ static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gb
 
     if (check != nullptr)
         *state = gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(check));
-}
-
-static void host_network(const WIFI_INTERFACE *iface)
-{
-    const WIFI_CELL *group = &iface->wifi_group;
-
-    if (!interface_usable(iface->name, "hosting the Ad-Hoc network"))
-        return;
-
-    g_autofree gchar *up = g_strdup_printf("ifconfig %s up", iface->name);
-    g_autofree gchar *essid = shell_escape(group->essid);
-    // The device hosts without a key; the group's key is only stored.
-    g_autofree gchar *iwset =
-        g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
-                        iface->name, essid, "Ad-Hoc", "off", encryption_word(group->encmode));
-    g_autofree gchar *echo = echo_command(group->essid, "/tmp/essid_tmp");
-
-    run_command(up);
-    printf("essid_buf = %s \n", echo);
-    leave_text_for_scripts(group->essid, "/tmp/essid_tmp", 0666);
-    printf("cmd=%s\r\n", iwset);
-    run_command(iwset);
 }
 
 static void set_list_sensitive(gboolean sensitive)
