@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <climits>
 #include <functional>
+#include <regex>
 
 #include "state.h"
 #include "wifi.h"
@@ -177,6 +178,25 @@ bool cell::operator==(const cell &other) const
            encmode == other.encmode;
 }
 
+// What a terminal may get: control characters as \xNN, those of two bytes too.
+static std::string shown(const std::string &text)
+{
+    static const std::regex control("[\x01-\x1F\x7F]|\xC2[\x80-\x9F]");
+    std::string result;
+    size_t end = 0;
+
+    for (std::sregex_iterator one(text.begin(), text.end(), control), none; one != none; ++one) {
+        result += text.substr(end, static_cast<size_t>(one->position()) - end);
+        for (const char byte : one->str()) {
+            char code[5];
+            snprintf(code, sizeof code, "\\x%02x", static_cast<unsigned char>(byte));
+            result += code;
+        }
+        end = static_cast<size_t>(one->position() + one->length());
+    }
+    return result + text.substr(end);
+}
+
 std::vector<cell> read_cells(const std::string &text, std::string *printed)
 {
     const std::string keywords[] = {
@@ -184,7 +204,7 @@ std::vector<cell> read_cells(const std::string &text, std::string *printed)
     std::string unread;
     std::string &log = printed ? *printed : unread;
     auto say = [&](const std::string &what) {
-        log += "WIRELESS-LAN-DEBUG: " + what + "\n";
+        log += "WIRELESS-LAN-DEBUG: " + shown(what) + "\n";
     };
     auto behind = [](const std::string &line, const std::string &keyword) {
         size_t at = line.find(keyword);

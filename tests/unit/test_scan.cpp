@@ -156,6 +156,31 @@ TEST(GetCell, RunsNothingForANameThatNoInterfaceHas)
     EXPECT_EQ(my_wifi->cell_count, 0);
 }
 
+TEST(GetCell, RunsNothingWithoutARecord)
+{
+    set_scan(NETWORK);
+    scan();
+    commands.clear();
+    testing::internal::CaptureStderr();
+    get_cell(nullptr);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), START);
+    EXPECT_TRUE(commands.empty());
+    EXPECT_EQ(my_wifi->cell_count, 0);
+}
+
+TEST(GetCell, PrintsNoControlCharacterOfAName)
+{
+    set_scan("Cell 01 - Address: 00:11:22:33:44:01\nESSID:\"a\x1B]0;x\a\xC2\x9B"
+             "2J\xC3\xA9\xE9\"\n"
+             "Bit Rates:54\n");
+    EXPECT_EQ(scan(), std::string(START) + "WIRELESS-LAN-DEBUG: FIND CELL[0]\n"
+                                           "WIRELESS-LAN-DEBUG: Address:00:11:22:33:44:01\n"
+                                           "WIRELESS-LAN-DEBUG: ESSID:a\\x1b]0;x\\x07\\xc2\\x9b"
+                                           "2J\xC3\xA9\xE9\n");
+    EXPECT_EQ(FIELD(*my_wifi->wifi_cell[0], essid), "a\x1B]0;x\a\xC2\x9B"
+                                                    "2J\xC3\xA9\xE9");
+}
+
 TEST(GetCell, IgnoresHowTheToolEnds)
 {
     set_tool_script("echo 'Cell 01 - Address: A'; echo 'Bit Rates:1'; exit 255");

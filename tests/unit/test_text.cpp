@@ -114,3 +114,40 @@ TEST(LogCritical, NamesThePlainFunctionAndTheExpression)
     EXPECT_EQ(message,
               std::to_string(G_LOG_LEVEL_CRITICAL) + " get_cell: assertion 'iface!=NULL' failed");
 }
+
+TEST(OneLine, HasBlanksForLineEnds)
+{
+    for (const auto &[text, expected] :
+         {std::pair("a\nb", "a b"), {"a\r\n", "a  "}, {"\n", " "}, {"a\tb", "a\tb"}, {"", ""}}) {
+        g_autofree gchar *line = one_line(text);
+        EXPECT_STREQ(line, expected);
+    }
+}
+
+TEST(Printable, ShowsControlCharactersAndLeavesTheRestByteForByte)
+{
+    const char *const cases[][2] = {
+        {"", ""},
+        {"plain \\x41 ~", "plain \\x41 ~"},
+        {"\x1B[2J\a\b", "\\x1b[2J\\x07\\x08"},
+        {"a\tb\r\n", "a\\x09b\\x0d\\x0a"},
+        {"\x01\x1F \x7F", "\\x01\\x1f \\x7f"},
+        {"\xC3\xA9\xE2\x98\x95\xF0\x9F\x93\xB6", "\xC3\xA9\xE2\x98\x95\xF0\x9F\x93\xB6"},
+        // U+009B begins a control sequence, as ESC [ does.
+        {"\xC2\x80\xC2\x9B\xC2\x9F\xC2\xA0", "\\xc2\\x80\\xc2\\x9b\\xc2\\x9f\xC2\xA0"},
+        {"\x9B\xE9\xFF\xA0\xC2", "\x9B\xE9\xFF\xA0\xC2"},
+    };
+    for (const auto &c : cases) {
+        g_autofree gchar *shown = printable(c[0]);
+        EXPECT_STREQ(shown, c[1]);
+    }
+}
+
+TEST(WipeText, LeavesNoTextBehind)
+{
+    gchar *text = g_strdup("secret"), *none = nullptr;
+    wipe_text(&text);
+    EXPECT_EQ(text, nullptr);
+    wipe_text(&none);
+    EXPECT_EQ(none, nullptr);
+}

@@ -108,7 +108,9 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
             unquote(value);
         copy_field(reinterpret_cast<char *>(cell) + VALUES[i].offset, VALUES[i].size, value);
         if (VALUES[i].label) {
-            fprintf(stderr, "WIRELESS-LAN-DEBUG: %s:%s\n", VALUES[i].label, value);
+            g_autofree gchar *shown = printable(value);
+
+            fprintf(stderr, "WIRELESS-LAN-DEBUG: %s:%s\n", VALUES[i].label, shown);
         } else {
             cell->encmode = scanned_encmode(value);
             fprintf(stderr, "WIRELESS-LAN-DEBUG: key:%d\n", static_cast<int>(cell->encmode));
@@ -169,7 +171,7 @@ void read_cells(FILE *stream)
 void get_cell(WIFI_INTERFACE *iface)
 {
     fprintf(stderr, "WIRELESS-LAN-DEBUG: get cell start...\n");
-    if (!interface_usable(iface->name, "the scan")) {
+    if (!iface || !interface_usable(iface->name, "the scan")) {
         release_cells();
         return;
     }

@@ -11,7 +11,8 @@
 
 // Brings `iface` up, runs "iwlist %s scan" (wireless-tools) on it and replaces wifi_cell and
 // cell_count of my_wifi by the networks printed, 128 at most. When the pipe cannot be opened the
-// former records stay. For a name that is not usable nothing is run and no network is left.
+// former records stay. Without a record, or for a name that is not usable, nothing is run and no
+// network is left.
 void get_cell(WIFI_INTERFACE *iface);
 
 // The same from an open stream, which stays open; a read error is its end.

@@ -4,9 +4,11 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "wifi_info/text.h"
+
 gchar *shell_escape(const char *text)
 {
-    GString *escaped = g_string_new(nullptr);
+    GString *escaped = g_string_sized_new(2 * strlen(text) + 1); // never moved, it may be a key
 
     for (; *text; text++) {
         if (strchr("\"\\$`", *text))
@@ -18,7 +20,7 @@ gchar *shell_escape(const char *text)
 
 gchar *echo_command(const char *text, const char *path)
 {
-    g_autofree gchar *escaped = shell_escape(text);
+    WIPED gchar *escaped = shell_escape(text);
 
     // An echo may take "-n" for an option, and that of dash turns "\t" into a tabulator.
     if (text[0] == '-' || strchr(text, '\\'))

@@ -1,6 +1,8 @@
 #include "wifi_info/text.h"
 
+#include <cerrno>
 #include <cstring>
+#include <initializer_list>
 
 #include <sys/stat.h>
 
@@ -44,13 +46,16 @@ FILE *open_text(const gchar *file)
 {
     FILE *stream = fopen(file, "re");
     struct stat status;
+    int reason = errno;
 
     if (stream && fstat(fileno(stream), &status) == 0 && S_ISDIR(status.st_mode)) {
         fclose(stream);
         stream = nullptr;
+        reason = EISDIR;
     }
     if (!stream)
         fprintf(stderr, "Could not access file: %s\n", file);
+    errno = reason;
     return stream;
 }
 
@@ -70,12 +75,55 @@ int decimal(const char *text)
     return static_cast<int>(CLAMP(g_ascii_strtoll(text, nullptr, 10), G_MININT, G_MAXINT));
 }
 
+gchar *one_line(const char *text)
+{
+    return g_strdelimit(g_strdup(text), "\r\n", ' ');
+}
+
+// How many bytes of `text` make a control character: 1 of ASCII, 2 of U+0080 to U+009F, else 0.
+static int control_length(const guchar *text)
+{
+    if (text[0] < 0x20 || text[0] == 0x7F)
+        return 1;
+    return text[0] == 0xC2 && text[1] >= 0x80 && text[1] < 0xA0 ? 2 : 0;
+}
+
+gchar *printable(const char *text)
+{
+    const guchar *byte = reinterpret_cast<const guchar *>(text);
+    GString *shown = g_string_sized_new(4 * strlen(text) + 1); // never moved, it may be a key
+
+    while (*byte != '\0') {
+        int length = control_length(byte);
+
+        if (length == 0)
+            g_string_append_c(shown, static_cast<gchar>(*byte++));
+        for (; length > 0; length--)
+            g_string_append_printf(shown, "\\x%02x", *byte++);
+    }
+    return g_string_free(shown, FALSE);
+}
+
+void wipe_text(gchar **text)
+{
+    if (*text != nullptr)
+        explicit_bzero(*text, strlen(*text));
+    g_clear_pointer(text, g_free);
+}
+
+void wipe_content(GString *content)
+{
+    explicit_bzero(content->str, content->allocated_len);
+    g_string_free(content, TRUE);
+}
+
 void append_line(GString *content, const char *keyword, const char *value)
 {
-    g_autofree gchar *line = g_strdup(value);
+    WIPED gchar *line = one_line(value);
 
-    g_strdelimit(line, "\r\n", ' ');
-    g_string_append_printf(content, "%s %s\n", keyword, line);
+    // Pieces, since a formatted line would leave a copy of a key behind.
+    for (const char *piece : {keyword, " ", static_cast<const char *>(line), "\n"})
+        g_string_append(content, piece);
 }
 
 void append_number_line(GString *content, const char *keyword, int value)
