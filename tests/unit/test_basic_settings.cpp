@@ -55,6 +55,7 @@ protected:
     }
     // What saving and reading print on the two streams.
     std::string errors, output;
+    gboolean whole = FALSE; // what the last reading returned
 
     gboolean save()
     {
@@ -63,11 +64,11 @@ protected:
         errors = testing::internal::GetCapturedStderr();
         return saved;
     }
-    void capture(void (*reader)(const gchar *))
+    void capture(gboolean (*reader)(const gchar *))
     {
         testing::internal::CaptureStderr();
         testing::internal::CaptureStdout();
-        reader(file.c_str());
+        whole = reader(file.c_str());
         output = testing::internal::GetCapturedStdout();
         errors = testing::internal::GetCapturedStderr();
     }
@@ -422,6 +423,8 @@ TEST_F(BasicSettings, AMissingFileOrAFolderChangesNothing)
         for (auto reader : {get_basic_setting_from_file, get_basic_setting_from_file_Advanced}) {
             capture(reader);
             EXPECT_EQ(errors, "Could not access file: " + path + "\n");
+            // Only a file that does not exist is an empty one.
+            EXPECT_EQ(whole, path != scratch_folder());
         }
         EXPECT_EQ(iface->wifi_group_enable, 1);
         EXPECT_STREQ(iface->wifi_group.essid, "e");

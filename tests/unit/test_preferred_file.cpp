@@ -15,6 +15,7 @@ class PreferredFile : public testing::Test
 protected:
     std::string file = scratch_folder() + "/wireless-user.conf";
     std::string errors;
+    gboolean read_whole = FALSE; // what the last reading returned
 
     void SetUp() override
     {
@@ -31,7 +32,7 @@ protected:
     void read()
     {
         testing::internal::CaptureStderr();
-        get_preferred_network_setting_from_file(file.c_str());
+        read_whole = get_preferred_network_setting_from_file(file.c_str());
         errors = testing::internal::GetCapturedStderr();
     }
     void read(const std::string &content)
@@ -264,6 +265,7 @@ TEST_F(PreferredFile, StopsAt64Networks)
                     "\n\n\n\n\n\nKEY USERCELL\n";
         read(text);
         EXPECT_EQ(my_wifi->user_cell_count, std::min(count, 64));
+        EXPECT_EQ(read_whole, count <= 64);
         EXPECT_EQ(my_wifi->user_wifi_cell[62]->alias, std::string("n62"));
         EXPECT_EQ(errors, count > 64 ? "WIRELESS-LAN-DEBUG: only the first 64 preferred networks "
                                        "are kept\n"
@@ -278,6 +280,8 @@ TEST_F(PreferredFile, MissingOrAFolderChangesNothing)
         file = path;
         read();
         EXPECT_EQ(errors, "Could not access file: " + path + "\n");
+        // Only a file that does not exist is an empty one.
+        EXPECT_EQ(read_whole, path != scratch_folder());
         EXPECT_EQ(my_wifi->user_cell_count, 1);
         EXPECT_STREQ(my_wifi->user_wifi_cell[0]->alias, "before");
     }

@@ -130,6 +130,55 @@ TEST_F(ReplaceFile, SaysWhyItFails)
     EXPECT_EQ(entries(), 1);
 }
 
+TEST_F(ReplaceFile, TellsWhetherAFileCouldBeOpened)
+{
+    g_autoptr(GError) error = nullptr;
+    EXPECT_FALSE(replace_file((folder + "/missing/conf").c_str(), "", 0, &error));
+    EXPECT_TRUE(g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED));
+    g_clear_error(&error);
+    EXPECT_FALSE(replace_file(folder.c_str(), "", 0, &error));
+    EXPECT_TRUE(g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED));
+}
+
+TEST_F(ReplaceFile, KeepsTheOldOneBesideIt)
+{
+    EXPECT_TRUE(keep_old_file(file.c_str(), nullptr));
+    EXPECT_EQ(entries(), 0);
+    for (const char *content : {"first", "second"}) {
+        write_file(file, content);
+        chmod(file.c_str(), 0644);
+        EXPECT_TRUE(keep_old_file(file.c_str(), nullptr));
+        EXPECT_TRUE(replace(file, "new"));
+        EXPECT_EQ(read_file(file + ".old"), content);
+        EXPECT_EQ(mode_of(file + ".old"), 0600u);
+        EXPECT_EQ(read_file(file), "new");
+    }
+    EXPECT_EQ(entries(), 2);
+}
+
+TEST_F(ReplaceFile, KeepsItWhereALinkLeads)
+{
+    fs::create_directory(folder + "/real");
+    write_file(folder + "/real/target", "old");
+    fs::create_symlink("real/target", file);
+    EXPECT_TRUE(keep_old_file(file.c_str(), nullptr));
+    EXPECT_EQ(read_file(folder + "/real/target.old"), "old");
+    EXPECT_EQ(entries(), 2);
+}
+
+TEST_F(ReplaceFile, SaysWhyNothingIsKept)
+{
+    g_autoptr(GError) error = nullptr;
+    EXPECT_FALSE(keep_old_file(folder.c_str(), &error));
+    EXPECT_EQ(error->message, folder + ": Is a directory");
+    g_clear_error(&error);
+    write_file(file, "old");
+    fs::create_directory(file + ".old");
+    EXPECT_FALSE(keep_old_file(file.c_str(), &error));
+    EXPECT_EQ(error->message, file + ".old: Is a directory");
+    EXPECT_EQ(read_file(file), "old");
+}
+
 TEST_F(ReplaceFile, LeavesADeviceADevice)
 {
     fs::create_symlink("/dev/null", file);

@@ -1,5 +1,6 @@
 #include "wifi_info/basic_settings.h"
 
+#include <cerrno>
 #include <cstdio>
 #include <cstring>
 
@@ -23,7 +24,7 @@ static const struct {
 
 static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 {
-    GString *text = g_string_new(nullptr);
+    GString *text = g_string_sized_new(sizeof *iface); // room for all fields: never moved
 
     append_line(text, "iface", iface->name);
     if (iface->isstatic) {
@@ -51,11 +52,14 @@ gboolean save_basic_setting_to_file(const gchar *file)
         return FALSE;
     }
 
-    g_autoptr(GString) text = basic_setting_text(iface);
     g_autoptr(GError) error = nullptr;
+    GString *text = basic_setting_text(iface);
+    const gboolean saved = replace_file(file, text->str, text->len, &error);
 
-    if (!replace_file(file, text->str, text->len, &error)) {
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: File %s cannot be open.\n", file);
+    wipe_content(text);
+    if (!saved) {
+        if (g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED))
+            fprintf(stderr, "WIRELESS-LAN-DEBUG: File %s cannot be open.\n", file);
         fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
         return FALSE;
     }
@@ -106,7 +110,10 @@ static gboolean find_stanza(FILE *stream, char *line)
         if (!g_str_has_prefix(line, "iface"))
             continue;
         get_piece(line, 1, name);
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: ifname:%s\n", name);
+
+        g_autofree gchar *shown = printable(name);
+
+        fprintf(stderr, "WIRELESS-LAN-DEBUG: ifname:%s\n", shown);
         if (iface && g_str_equal(name, iface->name))
             return TRUE;
     }
@@ -137,7 +144,10 @@ static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
     char value[LINE_SIZE];
 
     next_line(stream, line);
-    printf("buffer=%s\r\n", line);
+
+    g_autofree gchar *shown = printable(line);
+
+    printf("buffer=%s\r\n", shown);
     if (get_value(line, "wifigroup", value))
         iface->wifi_group_enable = decimal(value);
     next_line(stream, line);
@@ -197,9 +207,8 @@ void read_basic_settings_advanced(FILE *stream)
     read_addresses(stream, line);
 }
 
-// Opens the settings for a reader. The stream stays open behind it, so that the file that the
-// settings came from shows among the open files of the process; it is one, however often they are
-// read.
+// Opens the settings for a reader. The stream stays open until the next reading, so one of them is
+// open however often they are read.
 static FILE *open_settings(const gchar *file)
 {
     static FILE *settings = nullptr;
@@ -209,20 +218,24 @@ static FILE *open_settings(const gchar *file)
     return settings;
 }
 
-void get_basic_setting_from_file(const gchar *file)
+gboolean get_basic_setting_from_file(const gchar *file)
 {
     FILE *stream = open_settings(file);
 
-    if (stream)
-        read_basic_settings(stream);
+    if (!stream)
+        return errno == ENOENT;
+    read_basic_settings(stream);
+    return !ferror(stream);
 }
 
-void get_basic_setting_from_file_Advanced(const gchar *file)
+gboolean get_basic_setting_from_file_Advanced(const gchar *file)
 {
     FILE *stream = open_settings(file);
 
-    if (stream)
-        read_basic_settings_advanced(stream);
+    if (!stream)
+        return errno == ENOENT;
+    read_basic_settings_advanced(stream);
+    return !ferror(stream);
 }
 
 gchar *get_file_var(const gchar *file, const gchar *var)
@@ -257,5 +270,8 @@ void get_paramval(gchar *source, gchar *keyword, gchar *ret)
         return;
     }
     copy_second_word(ret, 128, source);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: paramval:%s\n", ret);
+
+    g_autofree gchar *shown = printable(ret);
+
+    fprintf(stderr, "WIRELESS-LAN-DEBUG: paramval:%s\n", shown);
 }

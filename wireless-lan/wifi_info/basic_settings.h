@@ -15,11 +15,12 @@ gboolean save_basic_setting_to_file(const gchar *file);
 
 // Reads them back. A file that cannot be opened changes nothing, one without a stanza for the
 // interface only empties the hosted network. The stream stays open until the next call of this
-// reader or the following one.
-void get_basic_setting_from_file(const gchar *file);
+// reader or the following one. FALSE when the file could not be opened or not be read to its end; a
+// file that does not exist is an empty one.
+gboolean get_basic_setting_from_file(const gchar *file);
 
 // Reads the addressing from a stanza that begins with "iface NAME inet METHOD" instead.
-void get_basic_setting_from_file_Advanced(const gchar *file);
+gboolean get_basic_setting_from_file_Advanced(const gchar *file);
 
 // The two readers over an open stream, which stays open; a read error is its end.
 void read_basic_settings(FILE *stream);

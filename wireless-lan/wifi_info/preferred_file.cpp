@@ -1,5 +1,6 @@
 #include "wifi_info/preferred_file.h"
 
+#include <cerrno>
 #include <cstdio>
 #include <cstring>
 
@@ -19,7 +20,9 @@ static const char *stored_encryption_word(t_encmode encmode)
 
 gboolean save_preferred_network_to_file(const gchar *file)
 {
-    g_autoptr(GString) text = g_string_new(nullptr);
+    // Room for every field at its longest, so that the text is never moved.
+    const gsize records = static_cast<gsize>(my_wifi->user_cell_count);
+    GString *text = g_string_sized_new(records * sizeof(WIFI_CELL) + 1);
 
     for (int i = 0; i < my_wifi->user_cell_count; i++) {
         const WIFI_CELL *cell = my_wifi->user_wifi_cell[i];
@@ -35,12 +38,12 @@ gboolean save_preferred_network_to_file(const gchar *file)
     }
 
     g_autoptr(GError) error = nullptr;
+    const gboolean saved = replace_file(file, text->str, text->len, &error);
 
-    if (!replace_file(file, text->str, text->len, &error)) {
+    wipe_content(text);
+    if (!saved)
         fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
-        return FALSE;
-    }
-    return TRUE;
+    return saved;
 }
 
 // Copies what stands behind the first blank, inner blanks included.
@@ -101,7 +104,7 @@ static void read_record(FILE *stream, WIFI_CELL *cell)
     }
 }
 
-void read_preferred_networks(FILE *stream)
+gboolean read_preferred_networks(FILE *stream)
 {
     char line[LINE_SIZE] = "";
     gboolean left_out = FALSE;
@@ -129,14 +132,18 @@ void read_preferred_networks(FILE *stream)
     if (left_out)
         fprintf(stderr, "WIRELESS-LAN-DEBUG: only the first %d preferred networks are kept\n",
                 MAX_USER_CELLS);
+    return !left_out && !ferror(stream);
 }
 
-void get_preferred_network_setting_from_file(const gchar *file)
+gboolean get_preferred_network_setting_from_file(const gchar *file)
 {
     FILE *stream = open_text(file);
 
     if (!stream)
-        return;
-    read_preferred_networks(stream);
+        return errno == ENOENT;
+
+    gboolean whole = read_preferred_networks(stream);
+
     fclose(stream);
+    return whole;
 }

@@ -15,9 +15,11 @@ gboolean save_preferred_network_to_file(const gchar *file);
 
 // Rebuilds user_wifi_cell and user_cell_count from the file. A 65th network is read over and
 // dropped, which one line on standard error says. A file that cannot be opened changes nothing.
-void get_preferred_network_setting_from_file(const gchar *file);
+// FALSE when the file holds more than is in memory now (it could not be opened or read to its end,
+// or networks were dropped); a file that does not exist is an empty one.
+gboolean get_preferred_network_setting_from_file(const gchar *file);
 
 // The same from an open stream, which stays open; a read error is its end.
-void read_preferred_networks(FILE *stream);
+gboolean read_preferred_networks(FILE *stream);
 
 #endif

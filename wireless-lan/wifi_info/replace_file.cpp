@@ -2,6 +2,7 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <cstring>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -74,11 +75,12 @@ static int fill(int fd, const struct stat *old, const char *content, gsize lengt
 }
 
 static int write_and_rename(const char *target, const struct stat *old, const char *content,
-                            gsize length)
+                            gsize length, replace_error *step)
 {
     g_autofree gchar *name = g_strconcat(target, ".XXXXXX", nullptr);
     int fd = g_mkstemp_full(name, O_WRONLY | O_CLOEXEC, 0600);
 
+    *step = fd < 0 ? REPLACE_NOT_OPENED : REPLACE_NOT_WRITTEN;
     if (fd < 0)
         return errno;
 
@@ -108,10 +110,12 @@ static int overwrite(int fd, const char *content, gsize length)
 
 // The room is reserved before a byte of the old content goes, and the old content is put back when
 // the new one cannot be written: only a power cut can leave half a file here.
-static int write_in_place(const char *target, const char *content, gsize length)
+static int write_in_place(const char *target, const char *content, gsize length,
+                          replace_error *step)
 {
     int fd = open(target, O_RDWR | O_CLOEXEC);
 
+    *step = fd < 0 ? REPLACE_NOT_OPENED : REPLACE_NOT_WRITTEN;
     if (fd < 0)
         return errno;
 
@@ -125,6 +129,7 @@ static int write_in_place(const char *target, const char *content, gsize length)
             reason = overwrite(fd, content, length);
         if (reason != 0)
             overwrite(fd, old, old_length);
+        explicit_bzero(old, old_length); // it holds keys
     }
     close(fd);
     return reason;
@@ -148,19 +153,61 @@ static int check_type(mode_t mode)
     return S_ISLNK(mode) ? ELOOP : ENOTSUP;
 }
 
+static gboolean report(const char *path, replace_error step, int reason, GError **error)
+{
+    if (reason != 0)
+        g_set_error(error, REPLACE_ERROR, step, "%s: %s", path, g_strerror(reason));
+    return reason == 0;
+}
+
 gboolean replace_file(const char *path, const char *content, gsize length, GError **error)
 {
     g_autofree gchar *target = resolve_links(path);
     struct stat old;
     gboolean exists = lstat(target, &old) == 0;
     int reason = exists ? check_type(old.st_mode) : errno;
+    replace_error step = REPLACE_NOT_OPENED;
 
     if (reason == 0 || reason == ENOENT)
-        reason = write_and_rename(target, exists ? &old : nullptr, content, length);
+        reason = write_and_rename(target, exists ? &old : nullptr, content, length, &step);
     if (exists && may_write_in_place(reason))
-        reason = write_in_place(target, content, length);
-    if (reason != 0)
-        g_set_error(error, G_FILE_ERROR, g_file_error_from_errno(reason), "%s: %s", path,
-                    g_strerror(reason));
-    return reason == 0;
+        reason = write_in_place(target, content, length, &step);
+    return report(path, step, reason, error);
+}
+
+// Puts a hard link to `target` in the place of `name`, whatever stands there.
+static int link_over(const char *target, const char *name)
+{
+    g_autofree gchar *link_name = g_strconcat(name, ".new", nullptr);
+
+    unlink(link_name);
+    if (link(target, link_name) != 0)
+        return errno;
+
+    const int reason = rename(link_name, name) != 0 ? errno : 0;
+
+    // A rename over another link to the same file leaves both.
+    unlink(link_name);
+    return reason;
+}
+
+gboolean keep_old_file(const char *path, GError **error)
+{
+    g_autofree gchar *target = resolve_links(path);
+    g_autofree gchar *kept = g_strconcat(target, ".old", nullptr);
+    g_autofree gchar *content = nullptr;
+    gsize length = 0;
+    struct stat old;
+
+    if (lstat(target, &old) != 0)
+        return errno == ENOENT || report(path, REPLACE_NOT_OPENED, errno, error);
+    if (check_type(old.st_mode) != 0)
+        return report(path, REPLACE_NOT_OPENED, check_type(old.st_mode), error);
+    if (!g_file_get_contents(target, &content, &length, nullptr))
+        return report(kept, REPLACE_NOT_WRITTEN, link_over(target, kept), error);
+
+    const gboolean done = replace_file(kept, content, length, error);
+
+    explicit_bzero(content, length);
+    return done;
 }

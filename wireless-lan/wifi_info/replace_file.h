@@ -5,11 +5,23 @@
 
 #include <glib.h>
 
+#define REPLACE_ERROR g_quark_from_static_string("replace-error")
+
+enum replace_error : int {
+    REPLACE_NOT_OPENED, // no file could be opened for the new content
+    REPLACE_NOT_WRITTEN // one could, and something failed after that
+};
+
 // Replaces the content of `path` by `length` bytes so that a power cut leaves the old or the new
 // file: a temporary file beside the target (behind symbolic links) is written, synced and renamed
-// over it; where that is impossible (bind mount, read-only folder) the file is written in place. A
-// new file gets mode 0600, an existing one keeps mode and owner. FALSE: the old file stands and
-// `error` (g_error_free it) says why.
+// over it; where that is impossible (bind mount, read-only directory) the file is written in place.
+// A new file gets mode 0600, an existing one keeps mode and owner. FALSE: the old file stands and
+// `error` (g_error_free it; domain REPLACE_ERROR, a replace_error as its code) says why.
 gboolean replace_file(const char *path, const char *content, gsize length, GError **error);
+
+// Keeps what `path` holds (behind symbolic links) beside it under its name with ".old" at the end,
+// in place of what was kept there before; a new file has mode 0600. A file that cannot be read is
+// kept as a hard link. TRUE also when there is no file to keep. FALSE: `error` says why.
+gboolean keep_old_file(const char *path, GError **error);
 
 #endif
