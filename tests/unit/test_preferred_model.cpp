@@ -13,8 +13,8 @@
 #include <gtk/gtk.h>
 #include <unistd.h>
 
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "preferred/list_dialog.h"
 #include "preferred/store.h"
 #include "wifi.h"

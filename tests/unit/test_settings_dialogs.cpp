@@ -4,8 +4,8 @@
 #include <gtest/gtest.h>
 #include <gtk/gtk.h>
 
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "settings/adhoc_dialog.h"
 #include "settings/wlan_dialog.h"
 #include "wifi.h"

@@ -6,8 +6,9 @@
 
 #include <glib/gi18n.h>
 
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/text.h"

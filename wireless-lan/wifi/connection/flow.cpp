@@ -6,9 +6,10 @@
 #include <glib/gi18n.h>
 
 #include "base/desktop.h"
+#include "base/dialogs.h"
 #include "base/network_list.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "connection/add_to_preferred.h"
 #include "connection/chosen_network.h"
 #include "connection/commands.h"

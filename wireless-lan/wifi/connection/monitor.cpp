@@ -8,8 +8,8 @@
 
 #include "base/desktop.h"
 #include "base/network_list.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "wifi.h"

@@ -1,6 +1,6 @@
 #include "connection/question.h"
 
-#include "base/widgets.h"
+#include "base/dialogs.h"
 
 gchar *ask_text(GtkWidget *parent, const gchar *message, const gchar *label)
 {

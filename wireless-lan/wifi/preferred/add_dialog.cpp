@@ -2,7 +2,7 @@
 
 #include <cstdio>
 
-#include "base/widgets.h"
+#include "base/dialogs.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"

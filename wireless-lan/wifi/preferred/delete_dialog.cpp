@@ -2,8 +2,8 @@
 
 #include <glib/gi18n.h>
 
+#include "base/dialogs.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "preferred/store.h"
 #include "wifi.h"
 

@@ -4,8 +4,9 @@
 
 #include <glib/gi18n.h>
 
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "preferred/add_dialog.h"
 #include "preferred/delete_dialog.h"
 #include "preferred/properties_dialog.h"

@@ -3,8 +3,9 @@
 #include <cstdio>
 #include <cstring>
 
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"

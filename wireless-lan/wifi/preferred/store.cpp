@@ -5,8 +5,9 @@
 
 #include <glib/gi18n.h>
 
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "wifi.h"
 #include "wifi_info/preferred_file.h"
 #include "wifi_info/text.h"
@@ -67,6 +68,15 @@ static void append_record(const WIFI_CELL *cell, gboolean say)
     if (say)
         printf("build_user_cell_clist, ftext[LIST_KEY_INDEX] = %s\n", ftext[LIST_KEY_INDEX]);
     append_row(ftext);
+}
+
+const gchar *clist_text(GtkWidget *clist, gint row, gint column)
+{
+    gchar *text = nullptr;
+
+    if (!gtk_clist_get_text(GTK_CLIST(clist), row, column, &text) || text == nullptr)
+        return "";
+    return text;
 }
 
 const gchar *user_cell_text(gint row, list_column column)

@@ -40,6 +40,9 @@ void save_user_cell_clist();
 // nothing added, when 64 networks are there or a list is missing.
 gboolean append_user_cell_row(const gchar *const ftext[LIST_COLUMNS]);
 
+// A row's text of a column list, "" when the cell has none. The list owns it.
+const gchar *clist_text(GtkWidget *clist, gint row, gint column);
+
 // The text of a backend column; the list owns it until the column is set.
 const gchar *user_cell_text(gint row, list_column column);
 

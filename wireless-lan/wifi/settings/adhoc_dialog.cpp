@@ -5,7 +5,7 @@
 
 #include <glib/gi18n.h>
 
-#include "base/widgets.h"
+#include "base/dialogs.h"
 #include "wifi.h"
 #include "wifi_info/text.h"
 

@@ -8,9 +8,10 @@
 #include <glib/gi18n.h>
 
 #include "base/desktop.h"
+#include "base/dialogs.h"
 #include "base/network_list.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "connection/monitor.h"

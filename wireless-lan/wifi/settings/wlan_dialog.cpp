@@ -5,8 +5,9 @@
 
 #include <glib/gi18n.h>
 
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "settings/adhoc_dialog.h"
 #include "settings/apply.h"
 #include "wifi.h"

@@ -5,7 +5,8 @@
 
 #include <glib/gi18n.h>
 
-#include "base/widgets.h"
+#include "base/dialogs.h"
+#include "base/registry.h"
 #include "wifi.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/shell.h"

@@ -3,8 +3,8 @@
 #include <glib/gi18n.h>
 
 #include "base/network_list.h"
+#include "base/registry.h"
 #include "base/state.h"
-#include "base/widgets.h"
 #include "connection/flow.h"
 #include "preferred/list_dialog.h"
 #include "settings/wlan_dialog.h"

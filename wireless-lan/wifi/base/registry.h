@@ -1,0 +1,27 @@
+// The named widgets of the main window.
+
+#ifndef WIFI_BASE_REGISTRY_H
+#define WIFI_BASE_REGISTRY_H
+
+#include <gtk/gtk.h>
+
+// Registers `widget` on the main window under `key`. A later widget under the same key replaces it;
+// a widget that is destroyed leaves the registry by itself.
+void register_widget(GtkWidget *widget, const char *key);
+
+// The same, and gives the widget the key as its name.
+void register_named_widget(GtkWidget *widget, const char *key);
+
+// The widget under `key`, NULL when there is none (or no main window).
+GtkWidget *find_widget(const char *key);
+
+// Sets the sensitivity of the widget under `key`; a missing widget is skipped.
+void set_widget_sensitive(const char *key, gboolean sensitive);
+
+// Sets the status label of the main window; skipped while it does not exist.
+void set_title_label(const gchar *text);
+
+// Sets the label of the Connect button to a stock id; skipped while it does not exist.
+void set_connect_label(const gchar *stock);
+
+#endif
