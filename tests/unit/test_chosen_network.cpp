@@ -51,6 +51,15 @@ struct ChosenNetwork : testing::Test {
         chosen.key_index = 2;
     }
 
+    gboolean take_up()
+    {
+        WIFI_CELL *cell = find_chosen_network(&chosen);
+
+        if (cell != nullptr)
+            take_answers_over(cell, &chosen);
+        return cell != nullptr;
+    }
+
     void expect_keys_nowhere_but(int index)
     {
         for (int i = 0; i < my_wifi->cell_count; i++)
@@ -61,7 +70,7 @@ struct ChosenNetwork : testing::Test {
 TEST_F(ChosenNetwork, GetsItsAnswers)
 {
     choose(1);
-    ASSERT_TRUE(take_up_network(&chosen));
+    ASSERT_TRUE(take_up());
     EXPECT_EQ(connect_index, 1);
     expect_keys_nowhere_but(1);
     EXPECT_EQ(my_wifi->wifi_cell[1]->encmode, ENC_OPEN);
@@ -78,7 +87,7 @@ TEST_F(ChosenNetwork, IsFoundWhereARefreshPutIt)
     add("02:00:00:00:00:04", "new");
     add("02:00:00:00:00:02", "home net");
     connect_index = 1; // as a refresh that matched the access point leaves it
-    ASSERT_TRUE(take_up_network(&chosen));
+    ASSERT_TRUE(take_up());
     EXPECT_EQ(connect_index, 3);
     expect_keys_nowhere_but(3);
 }
@@ -89,7 +98,7 @@ TEST_F(ChosenNetwork, OfAShorterScanIsNoOther)
     forget_cells();
     add("02:00:00:00:00:01", "cafe");
     connect_index = -1;
-    EXPECT_FALSE(take_up_network(&chosen));
+    EXPECT_FALSE(take_up());
     EXPECT_EQ(connect_index, -1);
     expect_keys_nowhere_but(-1);
 }
@@ -101,7 +110,7 @@ TEST_F(ChosenNetwork, IsNotItsNamesakeNorWhatItsAccessPointBecame)
     add("02:00:00:00:00:05", "home net");
     add("02:00:00:00:00:02", "other");
     connect_index = 1;
-    EXPECT_FALSE(take_up_network(&chosen));
+    EXPECT_FALSE(take_up());
     expect_keys_nowhere_but(-1);
 }
 
@@ -109,14 +118,14 @@ TEST_F(ChosenNetwork, IsGoneWithAnEmptyList)
 {
     choose(2);
     forget_cells();
-    EXPECT_FALSE(take_up_network(&chosen));
+    EXPECT_FALSE(take_up());
 }
 
 TEST_F(ChosenNetwork, ListedTwiceKeepsItsRow)
 {
     add("02:00:00:00:00:02", "home net");
     choose(3);
-    ASSERT_TRUE(take_up_network(&chosen));
+    ASSERT_TRUE(take_up());
     EXPECT_EQ(connect_index, 3);
     expect_keys_nowhere_but(3);
 }

@@ -7,10 +7,12 @@
 
 #include "wifi.h"
 
-// Makes the scanned network that `chosen` is a copy of the one at connect_index and gives its
-// record the copy's answers (encryption and key), since a refresh may have replaced the records
-// after the copy was made. FALSE, with nothing changed: no network with this access point and name
-// is there any more, and its key is for no other.
-gboolean take_up_network(const WIFI_CELL *chosen);
+// The scanned network that `chosen` is a copy of; connect_index becomes its index, since a refresh
+// may have replaced the records after the copy was made. NULL, with nothing changed: no network
+// with this access point and name is there any more, and its key is for no other.
+WIFI_CELL *find_chosen_network(const WIFI_CELL *chosen);
+
+// Copies the user's answers (encryption and key) from `chosen` into the record.
+void take_answers_over(WIFI_CELL *cell, const WIFI_CELL *chosen);
 
 #endif

@@ -30,11 +30,16 @@ static gboolean do_connect(gpointer data)
 {
     const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
 
-    if (chosen != nullptr && !take_up_network(chosen)) {
-        fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
-        set_title_label(_("Wireless network selection"));
-        give_controls_back();
-        return FALSE;
+    if (chosen != nullptr) {
+        WIFI_CELL *cell = find_chosen_network(chosen);
+
+        if (cell == nullptr) {
+            fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
+            set_title_label(_("Wireless network selection"));
+            give_controls_back();
+            return FALSE;
+        }
+        take_answers_over(cell, chosen);
     }
     apply_configuration();
     g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
@@ -79,11 +84,12 @@ static gboolean ask_name(WIFI_CELL *chosen)
         ask_text(parent, _("The essid is empty,Please input the Essid: "), _("Essid:"));
 
     gtk_widget_destroy(parent);
-    if (!take_up_network(chosen))
+
+    WIFI_CELL *cell = find_chosen_network(chosen);
+
+    if (cell == nullptr)
         return FALSE;
     if (name != nullptr) {
-        WIFI_CELL *cell = scanned_cell(connect_index);
-
         copy_field(cell->essid, sizeof cell->essid, name);
         copy_field(chosen->essid, sizeof chosen->essid, name);
         printf("input essid = %s \n", chosen->essid);
@@ -136,9 +142,15 @@ static void connect_encrypted(WIFI_CELL *chosen)
     gtk_widget_show_all(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
         read_answers(chosen);
-        if (take_up_network(chosen) && is_new_configuration(chosen, match_count))
-            Add2Preferred(dialog);
-        if (take_up_network(chosen))
+
+        WIFI_CELL *cell = find_chosen_network(chosen);
+
+        if (cell != nullptr) {
+            take_answers_over(cell, chosen);
+            if (is_new_configuration(chosen, match_count))
+                Add2Preferred(dialog);
+        }
+        if (find_chosen_network(chosen) != nullptr)
             start_connect(chosen);
     }
     g_clear_pointer(&sel_key, g_free);
@@ -181,7 +193,6 @@ static void connect_selected()
         return;
     }
     chosen.encmode = ENC_OFF;
-    take_up_network(&chosen);
     start_connect(&chosen);
 }
 
