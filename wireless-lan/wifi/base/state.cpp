@@ -13,8 +13,6 @@ gboolean doubleclick = TRUE;
 gint user_wifi_count = 0;
 GtkWidget *global_build_list = nullptr;
 gint boxspacing = 5;
-int key_mgmt = 0;
-int key_index = 0;
 
 gboolean my_wifi_init()
 {

@@ -16,8 +16,6 @@ extern gboolean doubleclick;  // a double click may connect; written by flow and
 extern gint user_wifi_count;  // rows of the preferred lists; written by the preferred rooms
 extern GtkWidget *global_build_list; // the front list of start-up; written by start_up
 extern gint boxspacing;              // padding of the settings' address rows, pixels
-extern int key_mgmt;                 // as last pre-filled by the encrypted dialog
-extern int key_index;                // likewise
 
 // Creates the zeroed state record with nothing selected. FALSE when memory is refused.
 gboolean my_wifi_init();

@@ -15,7 +15,16 @@
 
 static const guint PADDING = 5;
 
-gchar *sel_key = nullptr;
+// Registry keys of the dialog's controls while it is open.
+static const char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
+static const char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
+static const char ENTRY_KEY[] = "connect_key";
+
+// The key of the preferred network that was filled in, NULL: none.
+static gchar *sel_key = nullptr;
+// The key management and key index that were filled in with it.
+static int key_mgmt = 0;
+static int key_index = 0;
 
 // The network that the dialog was built for, by name: connect_index may move while it is open.
 static char sought_essid[sizeof(WIFI_CELL::essid)] = "";
@@ -188,7 +197,9 @@ gboolean connect_key_cb(GdkEventKey *)
     return FALSE;
 }
 
-gchar *entered_key()
+// The key in the dialog, NULL without a dialog. An untouched stored key comes back byte for byte,
+// also where it is no UTF-8. g_free it.
+static gchar *entered_key()
 {
     GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
 
@@ -201,6 +212,44 @@ gchar *entered_key()
             return g_strdup(sel_key);
     }
     return g_strdup(gtk_entry_get_text(entry));
+}
+
+// Reads the active item of the dialog's combo under `key` into `field` and prints it behind `name`.
+static void read_active(const char *key, guint32 *field, const char *name)
+{
+    GtkWidget *combo = find_widget(key);
+
+    if (combo == nullptr)
+        return;
+    *field = static_cast<guint32>(gtk_combo_box_get_active(GTK_COMBO_BOX(combo)));
+    printf("%s=%d\n", name, static_cast<int>(*field));
+}
+
+void read_answers(WIFI_CELL *chosen)
+{
+    g_autofree gchar *key = entered_key();
+
+    read_active(AUTHENTICATION_KEY, &chosen->key_mgmt, "key_mgmt");
+    read_active(KEY_INDEX_KEY, &chosen->key_index, "do connect key_index");
+    if (key != nullptr)
+        copy_field(chosen->userkey, sizeof chosen->userkey, key);
+    chosen->encmode = ENC_OPEN;
+}
+
+gboolean is_new_configuration(const WIFI_CELL *chosen, int match_count)
+{
+    if (match_count == 0)
+        return TRUE;
+    if (sel_key == nullptr)
+        return FALSE;
+    return strcmp(sel_key, chosen->userkey) != 0 ||
+           key_mgmt != static_cast<int>(chosen->key_mgmt) ||
+           key_index != static_cast<int>(chosen->key_index);
+}
+
+void forget_stored_key()
+{
+    g_clear_pointer(&sel_key, g_free);
 }
 
 static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
@@ -284,7 +333,7 @@ GtkWidget *build_encrypted_dialog(int *match_count)
     const WIFI_CELL *cell = scanned_cell(connect_index);
 
     copy_field(sought_essid, sizeof sought_essid, cell != nullptr ? cell->essid : "");
-    g_clear_pointer(&sel_key, g_free);
+    forget_stored_key();
 
     GtkWidget *dialog = create_dialog_window();
     GtkWidget *table = gtk_table_new(4, 2, FALSE);

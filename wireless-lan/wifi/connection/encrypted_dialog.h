@@ -5,22 +5,22 @@
 
 #include <gtk/gtk.h>
 
-// Keys of the dialog's controls while it is open.
-constexpr char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
-constexpr char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
-constexpr char ENTRY_KEY[] = "connect_key";
-
-// Key of the preferred network that was filled in, NULL: none. Written here, flow frees it.
-extern gchar *sel_key;
+#include "wifi.h"
 
 // Builds the dialog for the network at connect_index; `match_count` gets the number of preferred
 // networks of its name and stays as it is when the preferred lists are missing. The caller runs and
 // destroys it.
 GtkWidget *build_encrypted_dialog(int *match_count);
 
-// The key in the dialog, NULL without a dialog. An untouched stored key comes back byte for byte,
-// also where it is no UTF-8. g_free it.
-gchar *entered_key();
+// Copies the key, key management and key index of the dialog into `chosen`, whose encryption
+// becomes ENC_OPEN. Without the dialog's controls their fields stay.
+void read_answers(WIFI_CELL *chosen);
+
+// TRUE unless the answers in `chosen` repeat the preferred network that was filled in.
+gboolean is_new_configuration(const WIFI_CELL *chosen, int match_count);
+
+// Forgets the stored key that was filled in; called once the dialog is answered.
+void forget_stored_key();
 
 // The three combos of the dialog, filled from the preferred networks of its name. Without the
 // preferred lists the result is the invalid widget 1.

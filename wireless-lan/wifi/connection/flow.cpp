@@ -97,40 +97,6 @@ static gboolean ask_name(WIFI_CELL *chosen)
     return TRUE;
 }
 
-// Reads the active item of the dialog's combo under `key` into `field` and prints it behind `name`.
-static void read_active(const char *key, guint32 *field, const char *name)
-{
-    GtkWidget *combo = find_widget(key);
-
-    if (combo == nullptr)
-        return;
-    *field = static_cast<guint32>(gtk_combo_box_get_active(GTK_COMBO_BOX(combo)));
-    printf("%s=%d\n", name, static_cast<int>(*field));
-}
-
-static void read_answers(WIFI_CELL *chosen)
-{
-    g_autofree gchar *key = entered_key();
-
-    read_active(AUTHENTICATION_KEY, &chosen->key_mgmt, "key_mgmt");
-    read_active(KEY_INDEX_KEY, &chosen->key_index, "do connect key_index");
-    if (key != nullptr)
-        copy_field(chosen->userkey, sizeof chosen->userkey, key);
-    chosen->encmode = ENC_OPEN;
-}
-
-// TRUE unless the answers repeat the preferred network that was filled in.
-static gboolean is_new_configuration(const WIFI_CELL *chosen, int match_count)
-{
-    if (match_count == 0)
-        return TRUE;
-    if (sel_key == nullptr)
-        return FALSE;
-    return strcmp(sel_key, chosen->userkey) != 0 ||
-           key_mgmt != static_cast<int>(chosen->key_mgmt) ||
-           key_index != static_cast<int>(chosen->key_index);
-}
-
 // Runs the dialog of an encrypted network and connects on OK. The network is taken up afresh after
 // each dialog: when a refresh has lost it meanwhile the attempt just ends, since the key is for no
 // other network and the list already shows that this one is gone.
@@ -153,7 +119,7 @@ static void connect_encrypted(WIFI_CELL *chosen)
         if (find_chosen_network(chosen) != nullptr)
             start_connect(chosen);
     }
-    g_clear_pointer(&sel_key, g_free);
+    forget_stored_key();
     end_dialog(dialog);
 }
 
