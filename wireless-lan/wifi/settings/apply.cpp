@@ -24,16 +24,10 @@
 static const guint FOLLOW_MS = 4000;
 
 const address_setting address_settings[4] = {
-    {"address", N_("Address"), N_("Enter your IP address here, e.g. 192.168.1.2"), &static_address,
-     &WIFI_INTERFACE::address},
-    {"netmask", N_("Netmask"), N_("Enter your netmask here, e.g. 255.255.255.0"), &static_netmask,
-     &WIFI_INTERFACE::netmask},
-    {"broadcast", N_("Broadcast"),
-     N_("Enter your broadcast address here, usually the same like your IP with 255 as last "
-        "number."),
-     &static_broadcast, &WIFI_INTERFACE::broadcast},
-    {"gateway", N_("Gateway"), N_("Enter the IP Address of your default gateway here."),
-     &static_gateway, &WIFI_INTERFACE::gateway},
+    {"address", &static_address, &WIFI_INTERFACE::address},
+    {"netmask", &static_netmask, &WIFI_INTERFACE::netmask},
+    {"broadcast", &static_broadcast, &WIFI_INTERFACE::broadcast},
+    {"gateway", &static_gateway, &WIFI_INTERFACE::gateway},
 };
 
 gchar *settings_key(const char *prefix, const char *iface_name)

@@ -10,8 +10,6 @@
 // One address of static addressing: its row in the dialog and the two places that keep its text.
 struct address_setting {
     const char *prefix; // of the entry's key, and the entry's widget name
-    const char *label;
-    const char *tooltip;
     gchar (*text)[32];
     char (WIFI_INTERFACE::*field)[32];
 };

@@ -17,6 +17,19 @@
 
 static GtkTooltips *tooltips = nullptr; // one object for every opening
 
+// What the rows of the addresses say, in the order of address_settings.
+static const struct {
+    const char *label;
+    const char *tooltip;
+} ADDRESS_TEXTS[] = {
+    {N_("Address"), N_("Enter your IP address here, e.g. 192.168.1.2")},
+    {N_("Netmask"), N_("Enter your netmask here, e.g. 255.255.255.0")},
+    {N_("Broadcast"), N_("Enter your broadcast address here, usually the same like your IP with "
+                         "255 as last number.")},
+    {N_("Gateway"), N_("Enter the IP Address of your default gateway here.")},
+};
+static_assert(G_N_ELEMENTS(ADDRESS_TEXTS) == G_N_ELEMENTS(address_settings));
+
 static void set_active(GtkWidget *button, gboolean active)
 {
     gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(button), active);
@@ -102,12 +115,12 @@ static GtkWidget *create_type_radios(const WIFI_INTERFACE *iface)
 }
 
 static void create_propt_editable_entry(const WIFI_INTERFACE *iface, GtkWidget *attach_to,
-                                        const address_setting &setting, guint clnr, guint hspacing,
-                                        gboolean settext)
+                                        guint index, guint clnr, guint hspacing, gboolean settext)
 {
+    const address_setting &setting = address_settings[index];
     const guint padding = static_cast<guint>(boxspacing);
     const GtkAttachOptions expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
-    GtkWidget *label = gtk_label_new(_(setting.label));
+    GtkWidget *label = gtk_label_new(_(ADDRESS_TEXTS[index].label));
     GtkWidget *entry = gtk_entry_new();
     g_autofree gchar *key = settings_key(setting.prefix, iface->name);
 
@@ -122,7 +135,7 @@ static void create_propt_editable_entry(const WIFI_INTERFACE *iface, GtkWidget *
     gtk_misc_set_alignment(GTK_MISC(label), 0, 0.5);
     gtk_label_set_mnemonic_widget(GTK_LABEL(label), entry);
     for (GtkWidget *widget : {label, entry})
-        gtk_tooltips_set_tip(tooltips, widget, _(setting.tooltip), nullptr);
+        gtk_tooltips_set_tip(tooltips, widget, _(ADDRESS_TEXTS[index].tooltip), nullptr);
     gtk_table_attach(GTK_TABLE(attach_to), label, 0, 1, clnr, clnr + 1, GTK_FILL, GTK_FILL, padding,
                      hspacing);
     gtk_table_attach(GTK_TABLE(attach_to), entry, 1, 2, clnr, clnr + 1, expand, expand, padding,
@@ -156,8 +169,8 @@ static GtkWidget *create_network_widgets(WIFI_INTERFACE *iface)
 
     gtk_table_attach(GTK_TABLE(table), create_type_radios(iface), 0, 2, row, row + 1, GTK_FILL,
                      GTK_FILL, 0, 0);
-    for (const address_setting &setting : address_settings)
-        create_propt_editable_entry(iface, table, setting, ++row, static_cast<guint>(boxspacing),
+    for (guint i = 0; i < G_N_ELEMENTS(address_settings); i++)
+        create_propt_editable_entry(iface, table, i, ++row, static_cast<guint>(boxspacing),
                                     iface->isstatic);
     static_entry_status(iface->isstatic, iface->name);
     row++;
