@@ -7,6 +7,7 @@
 
 #include "state.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
 namespace model
 {

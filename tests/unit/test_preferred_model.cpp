@@ -18,6 +18,7 @@
 #include "preferred/list_dialog.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
 using std::string;
 

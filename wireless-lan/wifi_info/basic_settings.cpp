@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/encryption.h"
 #include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
@@ -48,7 +49,7 @@ gboolean save_basic_setting_to_file(const gchar *file)
     const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
 
     if (!iface) {
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: no interface, %s is not written\n", file);
+        debug_line("no interface, %s is not written", file);
         return FALSE;
     }
 
@@ -59,11 +60,11 @@ gboolean save_basic_setting_to_file(const gchar *file)
     wipe_content(text);
     if (!saved) {
         if (g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED))
-            fprintf(stderr, "WIRELESS-LAN-DEBUG: File %s cannot be open.\n", file);
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
+            debug_line("File %s cannot be open.", file);
+        debug_line("%s", error->message);
         return FALSE;
     }
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", iface->isstatic ? "isstatic" : "isdhcp");
+    debug_line("%s", iface->isstatic ? "isstatic" : "isdhcp");
     return TRUE;
 }
 
@@ -113,7 +114,7 @@ static gboolean find_stanza(FILE *stream, char *line)
 
         g_autofree gchar *shown = printable(name);
 
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: ifname:%s\n", shown);
+        debug_line("ifname:%s", shown);
         if (iface && g_str_equal(name, iface->name))
             return TRUE;
     }
@@ -273,5 +274,5 @@ void get_paramval(gchar *source, gchar *keyword, gchar *ret)
 
     g_autofree gchar *shown = printable(ret);
 
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: paramval:%s\n", shown);
+    debug_line("paramval:%s", shown);
 }

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
 
@@ -42,7 +43,7 @@ gboolean save_preferred_network_to_file(const gchar *file)
 
     wipe_content(text);
     if (!saved)
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s\n", error->message);
+        debug_line("%s", error->message);
     return saved;
 }
 
@@ -130,8 +131,7 @@ gboolean read_preferred_networks(FILE *stream)
     }
     my_wifi->user_cell_count = count;
     if (left_out)
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: only the first %d preferred networks are kept\n",
-                MAX_USER_CELLS);
+        debug_line("only the first %d preferred networks are kept", MAX_USER_CELLS);
     return !left_out && !ferror(stream);
 }
 

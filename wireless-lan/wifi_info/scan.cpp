@@ -7,6 +7,7 @@
 #include <libintl.h>
 
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
@@ -110,10 +111,10 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
         if (VALUES[i].label) {
             g_autofree gchar *shown = printable(value);
 
-            fprintf(stderr, "WIRELESS-LAN-DEBUG: %s:%s\n", VALUES[i].label, shown);
+            debug_line("%s:%s", VALUES[i].label, shown);
         } else {
             cell->encmode = scanned_encmode(value);
-            fprintf(stderr, "WIRELESS-LAN-DEBUG: key:%d\n", static_cast<int>(cell->encmode));
+            debug_line("key:%d", static_cast<int>(cell->encmode));
         }
         return TRUE;
     }
@@ -153,7 +154,7 @@ void read_cells(FILE *stream)
     while (fgets(line, sizeof line, stream)) {
         if (!strstr(line, "Cell"))
             continue;
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: FIND CELL[%d]\n", my_wifi->cell_count);
+        debug_line("FIND CELL[%d]", my_wifi->cell_count);
 
         WIFI_CELL *cell = g_new0(WIFI_CELL, 1);
 
@@ -170,7 +171,7 @@ void read_cells(FILE *stream)
 
 void get_cell(WIFI_INTERFACE *iface)
 {
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: get cell start...\n");
+    debug_line("get cell start...");
     if (!iface || !interface_usable(iface->name, "the scan")) {
         release_cells();
         return;

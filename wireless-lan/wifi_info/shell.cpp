@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "wifi_info/debug.h"
 #include "wifi_info/text.h"
 
 gchar *shell_escape(const char *text)
@@ -57,7 +58,7 @@ gboolean interface_usable(const char *name, const char *step)
 {
     if (is_plain_name(name))
         return TRUE;
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: no usable interface name, skipping %s\n", step);
+    debug_line("no usable interface name, skipping %s", step);
     return FALSE;
 }
 

@@ -1,12 +1,13 @@
 #include "base/desktop.h"
 
-#include <cstdio>
 #include <cstring>
 #include <unistd.h>
 
 #include <X11/Xatom.h>
 #include <X11/Xlib.h>
 #include <gdk/gdkx.h>
+
+#include "wifi_info/debug.h"
 
 void send_atom_to_desktop(const gchar *atom_str, int data)
 {
@@ -18,7 +19,7 @@ void send_atom_to_desktop(const gchar *atom_str, int data)
     char text[256];
 
     g_snprintf(text, sizeof text, "%d", data);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: send_atom_to_desktop [%s]\n", atom_str);
+    debug_line("send_atom_to_desktop [%s]", atom_str);
     XChangeProperty(display, DefaultRootWindow(display), atom, XA_STRING, 8, PropModeReplace,
                     reinterpret_cast<const unsigned char *>(text), static_cast<int>(strlen(text)));
     XFlush(display);

@@ -10,6 +10,7 @@
 #include "base/state.h"
 #include "connection/interface_state.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
 
@@ -47,7 +48,7 @@ void leave_text_for_scripts(const char *text, const char *path, guint mode)
     // mknod makes a plain file as open(O_EXCL) does, and needs no descriptor.
     unlink(path);
     if (mknod(path, S_IFREG | mode, 0) != 0) {
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s is not written: %s\n", path, g_strerror(errno));
+        debug_line("%s is not written: %s", path, g_strerror(errno));
         return;
     }
 
@@ -68,8 +69,8 @@ void apply_configuration()
 
     bring_interface_up(iface->name);
     clear_address(iface->name);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: essid to set:%s\n", cell->essid);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: interface:%s\n", iface->name);
+    debug_line("essid to set:%s", cell->essid);
+    debug_line("interface:%s", iface->name);
 
     g_autofree gchar *command = iwset_command(iface->name, cell);
 
@@ -121,11 +122,11 @@ gboolean require_ip_address()
         _exit(0);
     }
     if (child < 0)
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: fork PID %d error %d\n", child, errno);
+        debug_line("fork PID %d error %d", child, errno);
 
     const pid_t reaped = child > 0 ? waitpid(child, nullptr, 0) : -1;
 
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: wait fPID=%d,exPID=%d\n", child, reaped);
+    debug_line("wait fPID=%d,exPID=%d", child, reaped);
     return FALSE;
 }
 

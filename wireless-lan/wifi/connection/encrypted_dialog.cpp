@@ -11,6 +11,7 @@
 #include "base/state.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/text.h"
 
 static const guint PADDING = 5;
@@ -34,7 +35,7 @@ static GtkWidget *backend_list()
     GtkWidget *backend = find_widget(BACKEND_KEY);
 
     if (backend == nullptr)
-        fputs("WIRELESS-LAN-DEBUG: user_cell_list_backend get failed.\n", stderr);
+        debug_line("user_cell_list_backend get failed.");
     return backend;
 }
 
@@ -342,7 +343,7 @@ GtkWidget *build_encrypted_dialog(int *match_count)
     GtkWidget *entry = gtk_entry_new();
     GtkWidget *index = create_Key_Index_ComboBox();
 
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: create_ComboBox match_count=%d\n", *match_count);
+    debug_line("create_ComboBox match_count=%d", *match_count);
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table);
     attach_notice(table);

@@ -17,6 +17,7 @@
 #include "connection/monitor.h"
 #include "connection/question.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/text.h"
 
@@ -34,7 +35,7 @@ static gboolean do_connect(gpointer data)
         WIFI_CELL *cell = find_chosen_network(chosen);
 
         if (cell == nullptr) {
-            fputs("WIRELESS-LAN-DEBUG: the chosen network is gone, it is not connected\n", stderr);
+            debug_line("the chosen network is gone, it is not connected");
             set_title_label(_("Wireless network selection"));
             give_controls_back();
             return FALSE;
@@ -125,8 +126,7 @@ static void connect_encrypted(WIFI_CELL *chosen)
 
 static void connect_selected()
 {
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: Choice to Connect index[%d],count[%d]\n",
-            my_wifi->cell_index, my_wifi->cell_count);
+    debug_line("Choice to Connect index[%d],count[%d]", my_wifi->cell_index, my_wifi->cell_count);
     get_interface();
     // Nothing is shown: a list without a device says enough, and the next refresh tells why.
     if (my_wifi->interface_count < 1)
@@ -145,7 +145,7 @@ static void connect_selected()
     connect_index = my_wifi->cell_index;
     if (cell->linkstate == 1) {
         g_timeout_add(COMMAND_DELAY_MS, do_disconnect, nullptr);
-        fputs("WIRELESS-LAN-DEBUG: now is link down.\n", stderr);
+        debug_line("now is link down.");
         return;
     }
 
@@ -200,8 +200,8 @@ gboolean cb_view_sel(GtkWidget *widget, GdkEventButton *event, void *)
         log_critical("cb_view_sel", "my_wifi->cell_count>0&&my_wifi->interface_count>0");
         return FALSE;
     }
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: Cell count %d index %d interface count %d\n",
-            my_wifi->cell_count, my_wifi->cell_index, my_wifi->interface_count);
+    debug_line("Cell count %d index %d interface count %d", my_wifi->cell_count,
+               my_wifi->cell_index, my_wifi->interface_count);
     follow_pointer(GTK_TREE_VIEW(widget), event);
     if (my_wifi->cell_index <= -1) {
         log_critical("cb_view_sel", "my_wifi->cell_index>-1");
@@ -214,8 +214,7 @@ gboolean cb_view_sel(GtkWidget *widget, GdkEventButton *event, void *)
         log_critical("cb_view_sel", "my_wifi->wifi_cell[my_wifi->cell_index]!=NULL");
         return FALSE;
     }
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: connect_index=%d,my_wifi->cell_index=[%d]\n",
-            connect_index, my_wifi->cell_index);
+    debug_line("connect_index=%d,my_wifi->cell_index=[%d]", connect_index, my_wifi->cell_index);
 
     const gboolean connected = cell->linkstate == 1;
 

@@ -16,6 +16,7 @@
 
 #include "base/state.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/text.h"
 
 // Puts a request for the interface that it names to the kernel. FALSE: errno says why.
@@ -62,7 +63,7 @@ void get_ap_mac()
     memcpy(mac, request.u.ap_addr.sa_data, sizeof mac);
     g_snprintf(Link_AP_MAC, sizeof Link_AP_MAC, "%02X:%02X:%02X:%02X:%02X:%02X", mac[0], mac[1],
                mac[2], mac[3], mac[4], mac[5]);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: Detect Linked Acess Pointer:%s\n", Link_AP_MAC);
+    debug_line("Detect Linked Acess Pointer:%s", Link_AP_MAC);
 }
 
 gboolean is_associated(const char *ap_address)
@@ -91,7 +92,7 @@ void get_interface_statistics_data(WIFI_INTERFACE *iface)
 
     memcpy(&address, &request.ifr_addr, sizeof address);
     copy_field(iface->address, sizeof iface->address, inet_ntoa(address.sin_addr));
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: address:%s\n", iface->address);
+    debug_line("address:%s", iface->address);
 }
 
 void clear_address(const char *name)
@@ -118,15 +119,13 @@ static void print_statics(char *values)
 
     if (field == nullptr)
         return;
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: bp--->%s\n", field);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: status=%x\n",
-            static_cast<unsigned>(strtoul(field, nullptr, 16)));
+    debug_line("bp--->%s", field);
+    debug_line("status=%x", static_cast<unsigned>(strtoul(field, nullptr, 16)));
     for (const char *label : {"link quality--->", "level=", "noise="}) {
         field = strtok_r(nullptr, " \n", &rest);
         if (field == nullptr)
             return;
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: %s%d\n", label,
-                static_cast<int>(strtol(field, nullptr, 10)));
+        debug_line("%s%d", label, static_cast<int>(strtol(field, nullptr, 10)));
     }
 }
 

@@ -1,6 +1,5 @@
 #include "connection/monitor.h"
 
-#include <cstdio>
 #include <cstring>
 #include <initializer_list>
 
@@ -13,6 +12,7 @@
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 
 static const int POLL_LIMIT = 21;
@@ -48,10 +48,10 @@ gboolean detect_network_interface_state(gpointer)
     static int count = 0; // shared by all chains
     const WIFI_INTERFACE *iface = first_interface();
 
-    fputs("WIRELESS-LAN-DEBUG: detect_network_interface_state ...\n", stderr);
+    debug_line("detect_network_interface_state ...");
     if (address_valid(first_interface())) {
         count = 0;
-        fputs("WIRELESS-LAN-DEBUG: acquire address successed.\n", stderr);
+        debug_line("acquire address successed.");
         send_status_to_desktop(STATUS_CONNECTED);
         set_title_label(_("Wireless network selection"));
         show_address();
@@ -66,7 +66,7 @@ gboolean detect_network_interface_state(gpointer)
     if (iface != nullptr && iface->wifi_group_enable)
         return FALSE;
 
-    fputs("WIRELESS-LAN-DEBUG: acquire address failed.\n", stderr);
+    debug_line("acquire address failed.");
     review_tree_vanpro(_("Connected\nIP address invalid"));
     set_title_label(_("Wireless network selection"));
 
@@ -82,7 +82,7 @@ static void acquire_address()
 {
     linkconnect = TRUE;
     send_status_to_desktop(STATUS_ASSOCIATED);
-    fputs("WIRELESS-LAN-DEBUG: link connected,then we will require ip address.\n", stderr);
+    debug_line("link connected,then we will require ip address.");
     review_tree_vanpro(_("Connected\nAcquire IP address..."));
     set_title_label(_("Connected\nAcquire IP address..."));
     require_ip_address();
@@ -93,7 +93,7 @@ static void give_up_link()
 {
     linkconnect = FALSE;
     send_status_to_desktop(STATUS_DISCONNECTED);
-    fputs("WIRELESS-LAN-DEBUG: Not connect,return.\n", stderr);
+    debug_line("Not connect,return.");
     review_tree_vanpro(_("Not Connect"));
 
     WIFI_CELL *cell = scanned_cell(connect_index);
@@ -116,7 +116,7 @@ gboolean detect_network_link_state(gpointer)
         link_count = 0;
         return FALSE;
     }
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: AP MAC[%s]:Disconnected\n", Link_AP_MAC);
+    debug_line("AP MAC[%s]:Disconnected", Link_AP_MAC);
     if (++link_count < POLL_LIMIT)
         return TRUE;
     link_count = 0;

@@ -6,6 +6,7 @@
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 
 // Adds what is entered as the last row and selects it. FALSE: the user was told what is wrong.
 static gboolean add_network(GtkWidget *dialog)
@@ -30,7 +31,7 @@ static gboolean add_network(GtkWidget *dialog)
         return FALSE;
     }
     select_user_cell_row(my_wifi->user_cell_index);
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: user_wifi_count=%d\n", my_wifi->user_cell_index);
+    debug_line("user_wifi_count=%d", my_wifi->user_cell_index);
     return TRUE;
 }
 

@@ -1,7 +1,5 @@
 #include "preferred/list_dialog.h"
 
-#include <cstdio>
-
 #include <glib/gi18n.h>
 
 #include "base/dialogs.h"
@@ -12,6 +10,7 @@
 #include "preferred/properties_dialog.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 
 // Scrolls to a row; the list itself does not, as it stands in a viewport at its full height.
 static void reveal_row(GtkWidget *front, gint row)
@@ -174,7 +173,7 @@ void cb_preferred_network_setting(GtkWidget *, gpointer)
 
     gtk_widget_show_all(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
-        fputs("WIRELESS-LAN-DEBUG: OK,we will connect network by this order.\n", stderr);
+        debug_line("OK,we will connect network by this order.");
         save_user_cell_clist();
         take_front_list_out();
     } else {

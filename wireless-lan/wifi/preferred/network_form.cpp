@@ -1,6 +1,5 @@
 #include "preferred/network_form.h"
 
-#include <cstdio>
 #include <cstring>
 #include <initializer_list>
 
@@ -9,6 +8,7 @@
 #include "base/dialogs.h"
 #include "base/registry.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/text.h"
 
 // The longest text that a record keeps.
@@ -282,7 +282,7 @@ void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data)
 
     if (!gtk_toggle_button_get_active(togglebutton))
         return;
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: user_data:%s\n", key_hbox);
+    debug_line("user_data:%s", key_hbox);
 
     const network_form &form =
         strcmp(key_hbox, add_form.key_hbox) == 0 ? add_form : properties_form;

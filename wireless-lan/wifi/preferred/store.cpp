@@ -9,6 +9,7 @@
 #include "base/registry.h"
 #include "base/state.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/preferred_file.h"
 #include "wifi_info/text.h"
 
@@ -255,5 +256,5 @@ void show_store_full(GtkWidget *parent)
 void clist_select_row(GtkWidget *, gint row, gint column, GdkEventButton *, gpointer)
 {
     my_wifi->user_cell_index = row;
-    fprintf(stderr, "WIRELESS-LAN-DEBUG: select row [%d],column [%d]\n", row, column);
+    debug_line("select row [%d],column [%d]", row, column);
 }

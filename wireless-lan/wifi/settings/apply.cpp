@@ -17,6 +17,7 @@
 #include "connection/monitor.h"
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
@@ -109,7 +110,7 @@ static gboolean enter_selection_mode()
 
     get_ap_mac();
     if (!is_associated(Link_AP_MAC)) {
-        fputs("WIRELESS-LAN-DEBUG: Current state:Disconnected\n", stderr);
+        debug_line("Current state:Disconnected");
         return FALSE;
     }
     review_tree_vanpro(_("Connected\nAcquire IP address..."));

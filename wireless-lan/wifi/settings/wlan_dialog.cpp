@@ -1,6 +1,5 @@
 #include "settings/wlan_dialog.h"
 
-#include <cstdio>
 #include <initializer_list>
 
 #include <glib/gi18n.h>
@@ -12,6 +11,7 @@
 #include "settings/apply.h"
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/text.h"
 
@@ -213,7 +213,7 @@ void cb_wifi_settings(GtkWidget *, gpointer)
     get_interface();
     if (my_wifi->interface_count < 1) {
         show_warring_dialog(mainwindow, _("No Wireless Device"));
-        fputs("WIRELESS-LAN-DEBUG: No interface\n", stderr);
+        debug_line("No interface");
         return;
     }
     get_basic_setting_from_file(SETTINGS_FILE);

@@ -6,6 +6,7 @@
 
 #include "base/desktop.h"
 #include "base/state.h"
+#include "wifi_info/debug.h"
 #include "window/activation.h"
 #include "window/main_window.h"
 
@@ -74,7 +75,7 @@ int main(int argc, char **argv)
     bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
     gtk_init(&argc, &argv);
     if (!my_wifi_init()) {
-        fputs("WIRELESS-LAN-DEBUG: my_wifi_init error!!!\r\n", stderr);
+        debug_line("my_wifi_init error!!!\r");
         return EXIT_SUCCESS;
     }
 

@@ -13,6 +13,7 @@
 #include "base/state.h"
 #include "connection/interface_state.h"
 #include "wifi.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/scan.h"
 #include "wifi_info/text.h"
@@ -22,7 +23,7 @@ static const guint SCAN_DELAY_MS = 100;
 
 gboolean cb_refresh_network(GtkWidget *, gpointer)
 {
-    fputs("WIRELESS-LAN-DEBUG: Searching...\n", stderr);
+    debug_line("Searching...");
     if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
         for (const char *key : {"view-press", "button-connect", "button-refresh"})
             set_widget_sensitive(key, FALSE);
@@ -36,7 +37,7 @@ gboolean cb_refresh_network(GtkWidget *, gpointer)
     if (my_wifi->interface_count < 1) {
         set_title_label(_("No Wireless Device"));
         show_warring_dialog(mainwindow, _("No Wireless Device"));
-        fputs("WIRELESS-LAN-DEBUG: No interface\n", stderr);
+        debug_line("No interface");
         return FALSE;
     }
 
@@ -60,8 +61,7 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
         cell->linkstate = 2;
         if (strcmp(Link_AP_MAC, cell->address) != 0)
             continue;
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: Match_AP_MAC:%s,address:%s\n", Link_AP_MAC,
-                cell->address);
+        debug_line("Match_AP_MAC:%s,address:%s", Link_AP_MAC, cell->address);
         cell->linkstate = 1;
         connect_index = i;
 
@@ -71,8 +71,8 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
                 : g_strdup_printf("%s:%s", _("Connected\nIP Address"), iface->address);
 
         copy_field(status, size, text);
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: connect_index[%d] BUFFER:%s\n", connect_index, status);
-        fprintf(stderr, "WIRELESS-LAN-DEBUG: matched connect info:state [%d],essid:[%s]",
+        debug_line("connect_index[%d] BUFFER:%s", connect_index, status);
+        fprintf(stderr, "%smatched connect info:state [%d],essid:[%s]", DEBUG_PREFIX,
                 cell->linkstate, cell->essid);
     }
     if (connect_index == -1)

@@ -1,11 +1,10 @@
 #include "window/start_up.h"
 
-#include <cstdio>
-
 #include "base/state.h"
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/basic_settings.h"
+#include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/preferred_file.h"
 #include "wifi_info/shell.h"
@@ -15,7 +14,7 @@ void load_configuration()
     get_interface();
     if (my_wifi->interface_count > 0) {
         bring_interface_up(first_interface()->name);
-        fputs("WIRELESS-LAN-DEBUG: find a wifi device,up it\n", stderr);
+        debug_line("find a wifi device,up it");
     }
     get_basic_setting_from_file(SETTINGS_FILE);
     get_preferred_network_setting_from_file(USER_FILE);
