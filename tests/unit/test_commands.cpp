@@ -29,11 +29,11 @@ static std::string command_for(const WIFI_CELL &cell)
 
 TEST(EncryptionWord, KnowsThreeWords)
 {
-    EXPECT_STREQ(encryption_word(ENC_OFF), "off");
-    EXPECT_STREQ(encryption_word(ENC_OPEN), "open");
-    EXPECT_STREQ(encryption_word(ENC_RESTRICTED), "restricted");
-    EXPECT_STREQ(encryption_word(static_cast<t_encmode>(3)), "restricted");
-    EXPECT_STREQ(encryption_word(static_cast<t_encmode>(0xFFFFFFFF)), "restricted");
+    EXPECT_STREQ(encryption_word(ENC_OFF, FILE_WORDS), "off");
+    EXPECT_STREQ(encryption_word(ENC_OPEN, FILE_WORDS), "open");
+    EXPECT_STREQ(encryption_word(ENC_RESTRICTED, FILE_WORDS), "restricted");
+    EXPECT_STREQ(encryption_word(static_cast<t_encmode>(3), FILE_WORDS), "restricted");
+    EXPECT_STREQ(encryption_word(static_cast<t_encmode>(0xFFFFFFFF), FILE_WORDS), "restricted");
 }
 
 TEST(ClientMode, TurnsMasterIntoManagedInAnyCase)

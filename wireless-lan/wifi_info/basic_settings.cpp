@@ -40,7 +40,7 @@ static GString *basic_setting_text(const WIFI_INTERFACE *iface)
     append_line(text, "ESSID", iface->wifi_group.essid);
     append_line(text, "MODE", "Ad-Hoc");
     append_line(text, "KEY", iface->wifi_group.userkey);
-    append_line(text, "Encryption", encryption_word(iface->wifi_group.encmode));
+    append_line(text, "Encryption", encryption_word(iface->wifi_group.encmode, FILE_WORDS));
     return text;
 }
 
@@ -161,12 +161,8 @@ static void read_group(FILE *stream, char *line, WIFI_INTERFACE *iface)
     if (get_value(line, "KEY", value))
         copy_field(group->userkey, sizeof group->userkey, value);
     next_line(stream, line);
-    if (!get_value(line, "Encryption", value))
-        return;
-    if (g_str_equal(value, "off"))
-        group->encmode = ENC_OFF;
-    else
-        group->encmode = g_str_equal(value, "open") ? ENC_OPEN : ENC_RESTRICTED;
+    if (get_value(line, "Encryption", value))
+        group->encmode = encryption_of(value, FILE_WORDS, ENC_RESTRICTED);
 }
 
 void read_basic_settings(FILE *stream)

@@ -1,16 +1,27 @@
 #include "wifi_info/encryption.h"
 
+#include <initializer_list>
+
+#include <glib.h>
+
 #include "wifi.h"
 
-const char *encryption_word(t_encmode encmode)
+// By t_encmode and encryption_words.
+static const char *const WORDS[][3] = {
+    {"off", "off", "ENC_OFF"},
+    {"on", "open", "ENC_OPEN"},
+    {nullptr, "restricted", "ENC_RESTRICTED"},
+};
+
+const char *encryption_word(t_encmode encmode, encryption_words words)
 {
-    switch (encmode) {
-    case ENC_OFF:
-        return "off";
-    case ENC_OPEN:
-        return "open";
-    case ENC_RESTRICTED:
-        break;
-    }
-    return "restricted";
+    return WORDS[MIN(encmode, ENC_RESTRICTED)][words];
+}
+
+t_encmode encryption_of(const char *word, encryption_words words, t_encmode otherwise)
+{
+    for (const t_encmode encmode : {ENC_OFF, ENC_OPEN, ENC_RESTRICTED})
+        if (g_strcmp0(word, WORDS[encmode][words]) == 0)
+            return encmode;
+    return otherwise;
 }

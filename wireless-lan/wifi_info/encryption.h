@@ -5,8 +5,17 @@
 
 #include "wifi.h"
 
-// The word for an encryption in /etc/wireless.conf and for /sbin/iwset: "off", "open" or (any other
-// value) "restricted".
-const char *encryption_word(t_encmode encmode);
+enum encryption_words {
+    SCAN_WORDS, // of iwlist: "off" and "on", which stands for ENC_OPEN
+    FILE_WORDS, // of both files and of /sbin/iwset: "off", "open" and "restricted"
+    LIST_WORDS  // of the preferred lists: "ENC_OFF", "ENC_OPEN" and "ENC_RESTRICTED"
+};
+
+// The word for an encryption among FILE_WORDS or LIST_WORDS; a number that names none gives that of
+// ENC_RESTRICTED.
+const char *encryption_word(t_encmode encmode, encryption_words words);
+
+// The encryption that `word` names, `otherwise` when it is none of the words.
+t_encmode encryption_of(const char *word, encryption_words words, t_encmode otherwise);
 
 #endif

@@ -6,18 +6,11 @@
 
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/encryption.h"
 #include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
 
 constexpr int LINE_SIZE = 255;
-
-// Any other number is "off" here, while /etc/wireless.conf takes it for "restricted".
-static const char *stored_encryption_word(t_encmode encmode)
-{
-    if (encmode == ENC_RESTRICTED)
-        return "restricted";
-    return encmode == ENC_OPEN ? "open" : "off";
-}
 
 gboolean save_preferred_network_to_file(const gchar *file)
 {
@@ -34,7 +27,11 @@ gboolean save_preferred_network_to_file(const gchar *file)
         append_line(text, "MODE", cell->mode);
         append_number_line(text, "KMGMT", static_cast<int>(cell->key_mgmt));
         append_number_line(text, "KINDEX", static_cast<int>(cell->key_index));
-        append_line(text, "Encryption", stored_encryption_word(cell->encmode));
+        // A number that names none is "off" here, while /etc/wireless.conf takes it for
+        // "restricted".
+        append_line(
+            text, "Encryption",
+            encryption_word(cell->encmode <= ENC_RESTRICTED ? cell->encmode : ENC_OFF, FILE_WORDS));
         append_line(text, "KEY", cell->encmode == ENC_OFF ? "off" : cell->userkey);
     }
 
@@ -60,9 +57,7 @@ static t_encmode read_encryption(const char *line)
     char word[128];
 
     copy_second_word(word, sizeof word, line);
-    if (g_str_equal(word, "open"))
-        return ENC_OPEN;
-    return g_str_equal(word, "restricted") ? ENC_RESTRICTED : ENC_OFF;
+    return encryption_of(word, FILE_WORDS, ENC_OFF);
 }
 
 static guint32 read_number(const char *line)

@@ -8,6 +8,7 @@
 
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
@@ -86,13 +87,6 @@ static gchar *unquote(gchar *name)
     return g_strstrip(name);
 }
 
-static t_encmode scanned_encmode(const char *word)
-{
-    if (g_str_equal(word, "on"))
-        return ENC_OPEN;
-    return g_str_equal(word, "off") ? ENC_OFF : ENC_RESTRICTED;
-}
-
 // Takes the first value of the line that the network still lacks. FALSE: the line has none.
 static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
 {
@@ -113,7 +107,7 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
 
             debug_line("%s:%s", VALUES[i].label, shown);
         } else {
-            cell->encmode = scanned_encmode(value);
+            cell->encmode = encryption_of(value, SCAN_WORDS, ENC_RESTRICTED);
             debug_line("key:%d", static_cast<int>(cell->encmode));
         }
         return TRUE;

@@ -7,6 +7,7 @@
 #include "connection/question.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/encryption.h"
 
 void Add2Preferred(GtkWidget *parent)
 {
@@ -28,8 +29,13 @@ void Add2Preferred(GtkWidget *parent)
 
     g_autofree gchar *management = g_strdup_printf("%d", static_cast<int>(cell.key_mgmt));
     g_autofree gchar *index = g_strdup_printf("%d", static_cast<int>(cell.key_index));
-    const gchar *const ftext[LIST_COLUMNS] = {
-        alias, cell.essid, client_mode(cell.mode), "ENC_OPEN", cell.userkey, management, index};
+    const gchar *const ftext[LIST_COLUMNS] = {alias,
+                                              cell.essid,
+                                              client_mode(cell.mode),
+                                              encryption_word(ENC_OPEN, LIST_WORDS),
+                                              cell.userkey,
+                                              management,
+                                              index};
 
     if (append_user_cell_row(ftext))
         save_user_cell_clist();

@@ -32,7 +32,7 @@ gchar *iwset_command(const char *name, const WIFI_CELL *cell)
     g_autofree gchar *essid = shell_escape(cell->essid);
     g_autofree gchar *mode = shell_escape(client_mode(cell->mode));
     g_autofree gchar *key = shell_escape(key_word(cell));
-    const char *enc = encryption_word(cell->encmode);
+    const char *enc = encryption_word(cell->encmode, FILE_WORDS);
 
     if (cell->key_mgmt == 0)
         return g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\""
@@ -93,9 +93,9 @@ void host_network(const WIFI_INTERFACE *iface)
     g_autofree gchar *up = g_strdup_printf("ifconfig %s up", iface->name);
     g_autofree gchar *essid = shell_escape(group->essid);
     // The device hosts without a key; the group's key is only stored.
-    g_autofree gchar *iwset =
-        g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
-                        iface->name, essid, "Ad-Hoc", "off", encryption_word(group->encmode));
+    g_autofree gchar *iwset = g_strdup_printf(
+        "/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"", iface->name, essid,
+        "Ad-Hoc", "off", encryption_word(group->encmode, FILE_WORDS));
     g_autofree gchar *echo = echo_command(group->essid, ESSID_FILE);
 
     run_command(up);

@@ -7,6 +7,7 @@
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/encryption.h"
 
 // Adds what is entered as the last row and selects it. FALSE: the user was told what is wrong.
 static gboolean add_network(GtkWidget *dialog)
@@ -19,7 +20,7 @@ static gboolean add_network(GtkWidget *dialog)
         form_text(add_form.alias),
         form_text(add_form.essid),
         form_mode(add_form),
-        form_enc(add_form),
+        encryption_word(form_enc(add_form), LIST_WORDS),
         form_text(add_form.key),
         form_key_mgmt(add_form),
         key_index_text,

@@ -26,9 +26,7 @@ const network_form add_form = {
     "add_mode_managed",
     "add_mode_ad-hoc",
     "wep_container",
-    "add_enc_off",
-    "add_enc_open",
-    "add_enc_restricted",
+    {"add_enc_off", "add_enc_open", "add_enc_restricted"},
     "add_key_hbox",
     "add_key",
     "add_key_index",
@@ -37,12 +35,21 @@ const network_form add_form = {
 };
 
 const network_form properties_form = {
-    N_("Properties"),          "properties_alias",       "properties_essid",
-    "properties_add_wep",      "properties_add_wpa",     "properties_mode_container",
-    "properties_mode_managed", "properties_mode_ad-hoc", "properties_wep_container",
-    "properties_enc_off",      "properties_enc_open",    "properties_enc_restricted",
-    "properties_key_hbox",     "properties_key",         "properties_key_index",
-    change_prefer_wep_type,    change_prefer_wpa_type,
+    N_("Properties"),
+    "properties_alias",
+    "properties_essid",
+    "properties_add_wep",
+    "properties_add_wpa",
+    "properties_mode_container",
+    "properties_mode_managed",
+    "properties_mode_ad-hoc",
+    "properties_wep_container",
+    {"properties_enc_off", "properties_enc_open", "properties_enc_restricted"},
+    "properties_key_hbox",
+    "properties_key",
+    "properties_key_index",
+    change_prefer_wep_type,
+    change_prefer_wpa_type,
 };
 
 // A label that names `target` to assistive technology.
@@ -114,10 +121,10 @@ static GtkWidget *create_mode_row(const network_form &form)
 static GtkWidget *create_key_state_row(const network_form &form)
 {
     GtkWidget *box = create_box(form.wep_container);
-    GtkWidget *off = add_radio(box, nullptr, _("off"), form.enc_off);
+    GtkWidget *off = add_radio(box, nullptr, _("off"), form.enc[ENC_OFF]);
 
-    add_radio(box, off, _("open"), form.enc_open);
-    add_radio(box, off, _("restricted"), form.enc_restricted);
+    add_radio(box, off, _("open"), form.enc[ENC_OPEN]);
+    add_radio(box, off, _("restricted"), form.enc[ENC_RESTRICTED]);
     return box;
 }
 
@@ -178,7 +185,7 @@ void connect_network_form(const network_form &form)
 
     connect(form.wep, G_CALLBACK(form.change_wep), nullptr);
     connect(form.wpa, G_CALLBACK(form.change_wpa), nullptr);
-    for (const char *key : {form.enc_off, form.enc_open, form.enc_restricted})
+    for (const char *key : form.enc)
         connect(key, G_CALLBACK(changed_enc_type), form.key_hbox);
 }
 
@@ -217,11 +224,11 @@ const char *form_mode(const network_form &form)
     return radio_chosen(form.mode_adhoc) ? "Ad-Hoc" : "Managed";
 }
 
-const char *form_enc(const network_form &form)
+t_encmode form_enc(const network_form &form)
 {
-    if (radio_chosen(form.enc_off))
-        return "ENC_OFF";
-    return radio_chosen(form.enc_open) ? "ENC_OPEN" : "ENC_RESTRICTED";
+    if (radio_chosen(form.enc[ENC_OFF]))
+        return ENC_OFF;
+    return radio_chosen(form.enc[ENC_OPEN]) ? ENC_OPEN : ENC_RESTRICTED;
 }
 
 gchar *form_key_index(const network_form &form)
@@ -251,7 +258,7 @@ static void follow_key_mgmt(const network_form &form, gboolean wpa)
 {
     set_widget_sensitive(form.mode_container, !wpa);
     set_widget_sensitive(form.wep_container, !wpa);
-    choose_form_radio(wpa ? form.enc_open : form.enc_off);
+    choose_form_radio(form.enc[wpa ? ENC_OPEN : ENC_OFF]);
     set_widget_sensitive(form.key_index, !wpa);
     set_widget_sensitive(form.key_hbox, wpa);
 }
@@ -288,6 +295,6 @@ void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data)
         strcmp(key_hbox, add_form.key_hbox) == 0 ? add_form : properties_form;
     const GtkWidget *widget = GTK_WIDGET(togglebutton);
 
-    set_widget_sensitive(key_hbox, widget == find_widget(form.enc_open) ||
-                                       widget == find_widget(form.enc_restricted));
+    set_widget_sensitive(key_hbox, widget == find_widget(form.enc[ENC_OPEN]) ||
+                                       widget == find_widget(form.enc[ENC_RESTRICTED]));
 }

@@ -5,6 +5,8 @@
 
 #include <gtk/gtk.h>
 
+#include "wifi.h"
+
 typedef void (*toggle_handler)(GtkWidget *widget, gpointer data);
 
 // What the two forms differ in: the title, the registry keys of their widgets and who follows the
@@ -19,9 +21,7 @@ struct network_form {
     const char *mode_managed;
     const char *mode_adhoc;
     const char *wep_container;
-    const char *enc_off;
-    const char *enc_open;
-    const char *enc_restricted;
+    const char *enc[3]; // by t_encmode
     const char *key_hbox;
     const char *key;
     const char *key_index;
@@ -49,8 +49,8 @@ void choose_form_radio(const char *key);
 const gchar *form_text(const char *key);
 const char *form_key_mgmt(const network_form &form); // "0": WEP, "1": WPA
 const char *form_mode(const network_form &form);     // "Managed" or "Ad-Hoc"
-const char *form_enc(const network_form &form);      // "ENC_OFF", "ENC_OPEN" or "ENC_RESTRICTED"
-gchar *form_key_index(const network_form &form);     // from "0"; g_free it
+t_encmode form_enc(const network_form &form);
+gchar *form_key_index(const network_form &form); // from "0"; g_free it
 
 // TRUE when the text is there; otherwise the user is told what to enter. The key may be empty while
 // its row is insensitive.

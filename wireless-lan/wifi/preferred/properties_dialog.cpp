@@ -9,30 +9,26 @@
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"
+#include "wifi_info/encryption.h"
 #include "wifi_info/text.h"
 
 static const network_form &form = properties_form;
 
-static void choose_enc(const gchar *word)
+static t_encmode row_encryption(gint row)
 {
-    if (strcmp(word, "ENC_OFF") == 0)
-        choose_form_radio(form.enc_off);
-    else if (strcmp(word, "ENC_OPEN") == 0)
-        choose_form_radio(form.enc_open);
-    else
-        choose_form_radio(form.enc_restricted);
+    return encryption_of(user_cell_text(row, LIST_ENC), LIST_WORDS, ENC_RESTRICTED);
 }
 
 static void fill_form(gint row)
 {
-    const gchar *enc = user_cell_text(row, LIST_ENC);
+    const t_encmode encmode = row_encryption(row);
 
     set_form_text(form.alias, user_cell_text(row, LIST_ALIAS));
     set_form_text(form.essid, user_cell_text(row, LIST_ESSID));
     if (strcmp(user_cell_text(row, LIST_MODE), "Ad-Hoc") == 0)
         choose_form_radio(form.mode_adhoc);
-    choose_enc(enc);
-    set_widget_sensitive(form.key_hbox, strcmp(enc, "ENC_OFF") != 0);
+    choose_form_radio(form.enc[encmode]);
+    set_widget_sensitive(form.key_hbox, encmode != ENC_OFF);
     set_form_text(form.key, user_cell_text(row, LIST_KEY));
     printf("KEY_INDEX = %s \n", user_cell_text(row, LIST_KEY_INDEX));
     set_active_number(find_widget(form.key_index), user_cell_text(row, LIST_KEY_INDEX));
@@ -48,7 +44,7 @@ static void choose_key_mgmt(gint row)
     }
     choose_form_radio(form.wep);
     change_prefer_wep_type(find_widget(form.wep), nullptr);
-    choose_enc(user_cell_text(row, LIST_ENC));
+    choose_form_radio(form.enc[row_encryption(row)]);
 }
 
 // Stores an entry in its column. An entry that was left as it was filled leaves the column alone:
@@ -77,7 +73,7 @@ static gboolean store_network(gint row, GtkWidget *dialog)
     set_user_cell_text(row, LIST_KEY_MGMT, form_key_mgmt(form));
     set_user_cell_text(row, LIST_KEY_INDEX, key_index_text);
     set_user_cell_text(row, LIST_MODE, form_mode(form));
-    set_user_cell_text(row, LIST_ENC, form_enc(form));
+    set_user_cell_text(row, LIST_ENC, encryption_word(form_enc(form), LIST_WORDS));
     if (!form_has_key(form, dialog))
         return FALSE;
     store_entry(row, LIST_KEY, form.key);

@@ -10,6 +10,7 @@
 #include "base/state.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/encryption.h"
 #include "wifi_info/preferred_file.h"
 #include "wifi_info/text.h"
 
@@ -17,20 +18,6 @@
 // them then.
 static GtkWidget *front_list = nullptr;
 static GtkWidget *backend_list = nullptr;
-
-static const char *const enc_words[] = {"ENC_OFF", "ENC_OPEN", "ENC_RESTRICTED"};
-
-static const char *enc_word(t_encmode encmode)
-{
-    return enc_words[MIN(encmode, ENC_RESTRICTED)];
-}
-
-static t_encmode enc_value(const char *word)
-{
-    if (strcmp(word, enc_words[ENC_OFF]) == 0)
-        return ENC_OFF;
-    return strcmp(word, enc_words[ENC_OPEN]) == 0 ? ENC_OPEN : ENC_RESTRICTED;
-}
 
 static guint32 number_value(const char *text)
 {
@@ -63,7 +50,7 @@ static void append_record(const WIFI_CELL *cell, gboolean say)
     g_autofree gchar *key_mgmt_text = g_strdup_printf("%d", static_cast<int>(cell->key_mgmt));
     g_autofree gchar *key_index_text = g_strdup_printf("%d", static_cast<int>(cell->key_index));
     const gchar *const ftext[LIST_COLUMNS] = {
-        cell->alias,   cell->essid,   cell->mode,    enc_word(cell->encmode),
+        cell->alias,   cell->essid,   cell->mode,    encryption_word(cell->encmode, LIST_WORDS),
         cell->userkey, key_mgmt_text, key_index_text};
 
     if (say)
@@ -97,7 +84,7 @@ static void row_into_record(gint row, WIFI_CELL *cell)
     copy_field(cell->mode, sizeof cell->mode, user_cell_text(row, LIST_MODE));
     cell->key_mgmt = number_value(user_cell_text(row, LIST_KEY_MGMT));
     cell->key_index = number_value(user_cell_text(row, LIST_KEY_INDEX));
-    cell->encmode = enc_value(user_cell_text(row, LIST_ENC));
+    cell->encmode = encryption_of(user_cell_text(row, LIST_ENC), LIST_WORDS, ENC_RESTRICTED);
     copy_field(cell->userkey, sizeof cell->userkey, user_cell_text(row, LIST_KEY));
 }
 

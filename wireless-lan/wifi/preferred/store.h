@@ -14,7 +14,7 @@ enum list_column {
     LIST_ALIAS,
     LIST_ESSID,
     LIST_MODE, // "Managed" or "Ad-Hoc"
-    LIST_ENC,  // "ENC_OFF", "ENC_OPEN" or "ENC_RESTRICTED"
+    LIST_ENC,  // one of LIST_WORDS
     LIST_KEY,
     LIST_KEY_MGMT,  // "0": WEP, "1": WPA
     LIST_KEY_INDEX, // from "0"
