@@ -1,17 +1,20 @@
+# SPDX-License-Identifier: MIT
 """The other side of the air: simulated radios, access points, addresses, a second station.
 
 Radio 0 is the device's own and stays where the program is. All others live in network namespaces
 of their own, so that nothing reaches them but what is sent through the air. Every access point has
 a network of its own, 10.9.N.0/24 with the access point as 10.9.N.1: an address tells who gave it."""
 
-import os
 import subprocess
-import time
+
+from probe import wait_until
 
 AIR = "air"
 FAR = "far"
-BEYOND = "10.99.0.1"  # behind the gateways: answers only what is routed
+BEYOND = "10.99.0.1"  # beyond the gateways: answers only what is routed
 LOGS = "/share/out"
+
+_hostapd = {}  # the process of each radio
 
 
 def run(*command, netns=None, check=True, **more):
@@ -31,18 +34,6 @@ def start(*command, netns=None, log=None, env=None):
     out = open(f"{LOGS}/{log}", "ab") if log else subprocess.DEVNULL
     return subprocess.Popen(command, stdin=subprocess.DEVNULL, stdout=out, stderr=out,
                             env=env)
-
-
-def until(wanted, what, limit=60, pause=0.2):
-    """Wait until WANTED() is true and return its value; fail after LIMIT seconds."""
-    end = time.monotonic() + limit
-    while True:
-        value = wanted()
-        if value:
-            return value
-        if time.monotonic() > end:
-            raise TimeoutError(f"{what() if callable(what) else what} (waited {limit} s)")
-        time.sleep(pause)
 
 
 def radios(count):
@@ -70,7 +61,8 @@ def network(name, key=None, wep=None, hidden=False, net=None):
 
 
 def access_point(radio, channel, networks, beacon=50):
-    """Start hostapd on a radio of AIR with the given networks. Return the process."""
+    """Start hostapd on a radio of AIR with the given networks; its beacons come every BEACON
+    units of 1.024 ms."""
     first = f"wlan{radio}"
     lines = [f"interface={first}", "driver=nl80211", "hw_mode=g", f"channel={channel}",
              f"beacon_int={beacon}", "ctrl_interface=/run/hostapd"]
@@ -90,7 +82,7 @@ def access_point(radio, channel, networks, beacon=50):
     path = f"/tmp/hostapd-{radio}.conf"
     with open(path, "w") as file:
         file.write("\n".join(lines) + "\n")
-    process = start("hostapd", "-t", path, netns=AIR, log=f"hostapd-{radio}.log")
+    process = _hostapd[radio] = start("hostapd", "-t", path, netns=AIR, log=f"hostapd-{radio}.log")
     last = first if len(networks) == 1 else f"{first}_{len(networks) - 1}"
 
     def up():
@@ -98,12 +90,17 @@ def access_point(radio, channel, networks, beacon=50):
             raise RuntimeError(f"hostapd of radio {radio} ended, see hostapd-{radio}.log")
         return "ssid" in run("iw", "dev", last, "info", netns=AIR, check=False)
 
-    until(up, f"radio {radio} on the air", 120)
+    wait_until(up, f"radio {radio} on the air", 120)
     for index, one in enumerate(networks):
         if one["net"] is not None:
             device = f"{first}_{index}" if index else first
             run("ip", "addr", "replace", f"10.9.{one['net']}.1/24", "dev", device, netns=AIR)
-    return process
+
+
+def switch_off(radio):
+    """Ends the access point on a radio."""
+    _hostapd[radio].terminate()
+    _hostapd[radio].wait()
 
 
 def addresses(*nets):

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """scenarios.py GROUP: runs the scenarios of groups/GROUP.py, in the order of its list SCENARIOS.
 
 Every scenario is one function; its name, with blanks, is the name of the test. A group shares one
@@ -12,11 +13,12 @@ import traceback
 
 import air
 import window as w
-from air import run, until
+from air import run
+from probe import wait_until
 
 
 def look(name):
-    """Keep what helps to find out why a scenario failed."""
+    """Keeps what helps to find out why a scenario failed."""
     w.photograph(f"failed-{name}")
     with open(f"{air.LOGS}/failed-{name}.txt", "w") as file:
         for command in (("iw", "dev"), ("iw", "dev", "wlan0", "link"), ("ip", "addr"),
@@ -28,13 +30,13 @@ def look(name):
 def recover():
     """After a failure: no dialog in the way of the next scenario, and a program that runs."""
     for _ in range(4):
-        if len(w.windows()) > 1:
-            run("xdotool", "key", "Escape", check=False)
+        if w.app.running() and w.app.dialogs():
+            w.app.key("Escape")
             time.sleep(1)
-    if not w.alive():
+    if not w.app.running():
         w.begin()
-    until(lambda: w.widget("button-connect")["usable"] or w.title() == "Ad-Hoc Host Mode",
-          "the window is idle", 100, 1)
+    wait_until(lambda: w.app.find("button-connect")["usable"] or w.title() == "Ad-Hoc Host Mode",
+               "the window to be idle", 100)
 
 
 def main():
@@ -77,4 +79,5 @@ def main():
                 traceback.print_exc()
 
 
-main()
+if __name__ == "__main__":
+    main()

@@ -1,9 +1,14 @@
+# SPDX-License-Identifier: MIT
 """What a person does with the window, and what is checked after it: shared by the groups."""
 
 import re
 
 import window as w
-from air import run, until
+from air import run
+from probe import wait_until
+
+
+OFFER = "Do you want to add this configuration to the preferred network?"
 
 
 def check(condition, reason):
@@ -16,12 +21,12 @@ def same(got, wanted, what):
 
 
 def connected_to(net, limit=90):
-    """Wait until a row tells an address of subnet NET and the window is idle; return the row."""
-    prefix = f"Connected\nIP Address:10.9.{net}."
-    row = until(lambda: next((i for i, one in enumerate(w.rows()) if one[4].startswith(prefix)), -1)
-                + 1, f"a row with an address of 10.9.{net}.x", limit, 0.5) - 1
+    """Waits until a row shows an address of subnet NET and the window is idle; returns the row."""
+    wait_until(lambda: w.connected_row(net) is not None,
+               lambda: f"a row with an address of 10.9.{net}.x in {w.rows()}", limit)
+    row = w.connected_row(net)
     w.idle()
-    same(w.widget("button-connect")["label"], "gtk-disconnect", "the button")
+    same(w.app.label("button-connect"), "gtk-disconnect", "the button")
     shown = w.rows()[row][4][len("Connected\nIP Address:"):]
     have = re.findall(r"inet ([0-9.]+)/", run("ip", "-4", "addr", "show", "dev", "wlan0"))
     same(have, [shown], "the interface's address, as shown,")
@@ -32,19 +37,18 @@ def connected_to(net, limit=90):
 
 
 def answer_encrypted(key, remember=None, index=0, alias=""):
-    """Fill the dialog for the key: INDEX 1 of the first list is WPA. REMEMBER None: not asked."""
-    box = w.dialog("Encrypted Network")
-    kind = next(one for one in w.walk(box) if one.get("items") == ["WEP", "WPA-PSK/WPA2-PSK"])
-    if kind["active"] != index:
-        w.choose(kind, index)
+    """Fills the dialog for the key: INDEX 1 of the first list is WPA. REMEMBER None: not asked."""
+    box = w.app.dialog("Encrypted Network")
+    if box.find("Authentication_ComboBox")["active"] != index:
+        box.choose("Authentication_ComboBox", index)
     if key is not None:
-        w.fill(w.find(box, "GtkEntry"), key)
-    w.press_in(box, "gtk-ok")
+        box.type("connect_key", key)
+    box.press("gtk-ok")
     if remember is not None:
-        prompt = w.dialog("Do you want to add this configuration to the preferred network?")
+        prompt = w.app.dialog(text=OFFER)
         if remember:
-            w.fill(w.find(prompt, "GtkEntry"), alias)
-        w.press_in(prompt, "gtk-yes" if remember else "gtk-no")
+            prompt.type("GtkEntry", alias)
+        prompt.press("gtk-yes" if remember else "gtk-no")
 
 
 def wanted_row(name):
@@ -54,14 +58,14 @@ def wanted_row(name):
 
 
 def press_button(label):
-    """Press the button below the list once it says what it is to do."""
-    until(lambda: w.widget("button-connect")["label"] == label, f"the button says {label}", 20)
-    w.press(w.widget("button-connect"))
+    """Presses the button below the list once it says what it is to do."""
+    wait_until(lambda: w.app.label("button-connect") == label, f"the button to say {label}")
+    w.app.press("button-connect")
 
 
 def press_connect(name, nth=0):
     row = wanted_row(name) + nth
-    w.select_surely(row)
+    w.select(row)
     w.notices()
     press_button("gtk-connect")
     return row
@@ -76,8 +80,8 @@ def followed(*numbers, limit=20):
         return len(got) >= len(numbers)
 
     try:
-        until(all_there, "notices", limit)
-    except TimeoutError:
+        wait_until(all_there, "notices", limit)
+    except AssertionError:
         pass
     same(got, list(numbers), "the notices to the desktop")
 
@@ -89,19 +93,18 @@ def linked():
 
 
 def open_settings():
-    w.press(w.widget("button-wifi-settings"))
-    return w.dialog("WLAN Setting")
+    w.app.press("button-wifi-settings")
+    return w.app.dialog("WLAN Setting")
 
 
-def tick(box, kind, label, active=True):
-    """Press a radio or check button unless it is as wanted."""
-    button = w.find(box, kind, label=label)
-    if button["active"] != active:
-        w.press(button)
-        until(lambda: w.again(button)["active"] == active, f"{label} is {active}", 20)
+def tick(box, name, active=True):
+    """Presses a radio or check button unless it is as wanted."""
+    if box.find(name)["active"] != active:
+        box.press(name)
+        wait_until(lambda: box.find(name)["active"] == active, f"{name} to be {active}")
 
 
 def write_addresses(box, *values):
-    tick(box, "GtkRadioButton", "static")
+    tick(box, "staticwlan0")
     for name, value in zip(("address", "netmask", "broadcast", "gateway"), values):
-        w.fill(w.find(box, "GtkEntry", name), value)
+        box.type(name, value)

@@ -1,10 +1,12 @@
+# SPDX-License-Identifier: MIT
 """More networks than the list holds."""
 
 import re
 
 import air
 import window as w
-from air import network, run, until
+from air import network, run
+from probe import wait_until
 from steps import check, connected_to, press_connect, same
 
 
@@ -22,16 +24,15 @@ def prepare():
 
 
 def of_163_networks_128_are_listed():
-    found = until(lambda: run("iwlist", "wlan0", "scan", check=False).count("ESSID:") >= 163,
-                  "163 networks are on the air", 60)
-    check(found, "no networks")
+    wait_until(lambda: run("iwlist", "wlan0", "scan", check=False).count("ESSID:") >= 163,
+               "163 networks on the air")
     w.refresh()
     listed = [one[0] for one in w.rows()]
     same(len(listed), 128, "the number of rows")
     same(len(set(listed)), 128, "the number of different rows")
     check(all(re.fullmatch(r"Network \d{3}", one) for one in listed), f"the rows are {listed}")
     # All of them can be scrolled to: the list measures its rows little by little.
-    until(lambda: w.widget("view-press")["rect"][3] > 128 * 12, "the list is as high as its rows")
+    wait_until(lambda: w.app.find(w.LIST)["rect"][3] > 128 * 12, "the list to be as high as its rows")
     w.photograph("crowd")
 
 

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Every kind of network."""
 
 import os
@@ -5,7 +6,8 @@ import re
 
 import air
 import window as w
-from air import network, run, until
+from air import network, run
+from probe import wait_until
 from steps import (answer_encrypted, check, connected_to, followed, linked, press_button,
                    press_connect, same, wanted_row)
 
@@ -58,20 +60,18 @@ def an_open_network_gives_an_address():
 
 def a_refresh_finds_the_connected_network_again():
     w.refresh()
-    row = until(lambda: next((i + 1 for i, one in enumerate(w.rows())
-                              if one[4].startswith("Connected\nIP Address:10.9.1.")), 0),
-                "the connected row", 10) - 1
-    same(w.rows()[row][0], "Market", "the connected network")
+    wait_until(lambda: w.connected_row(1) is not None, "the connected row", 10)
+    same(w.rows()[w.connected_row(1)][0], "Market", "the connected network")
 
 
 def disconnect_leaves_the_network():
-    w.select_surely(wanted_row("Market"))
+    w.select(wanted_row("Market"))
     w.notices()
     press_button("gtk-disconnect")
-    until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
+    wait_until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
     followed("2")
-    until(lambda: w.widget("button-connect")["label"] == "gtk-connect", "the button")
-    until(lambda: not linked(), "the interface is not associated", 20)
+    wait_until(lambda: w.app.label("button-connect") == "gtk-connect", "the button")
+    wait_until(lambda: not linked(), "the interface is not associated", 20)
     same(run("ip", "-4", "-o", "addr", "show", "dev", "wlan0"), "", "the address")
     check(run("pidof", "wpa_supplicant", check=False) == "", "the supplicant still runs")
 
@@ -106,11 +106,11 @@ def its_key_is_for_root_alone():
 
 
 def a_remembered_network_by_double_click():
-    w.select_surely(wanted_row("Home Net"))
+    w.select(wanted_row("Home Net"))
     press_button("gtk-disconnect")
-    until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
+    wait_until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
     w.notices()
-    w.select(wanted_row("Home Net"), times=2)
+    w.app.click_row(w.LIST, wanted_row("Home Net"), count=2)
     answer_encrypted(None, index=1)
     connected_to(2)
     followed("2", "3", "4")
@@ -131,9 +131,9 @@ def wep_with_the_first_key():
 
 def a_hidden_network_by_the_name_typed():
     press_connect("")
-    box = w.dialog("The essid is empty")
-    w.fill(w.find(box, "GtkEntry"), "Cellar")
-    w.press_in(box, "gtk-yes")
+    box = w.app.dialog(text="The essid is empty,Please input the Essid: ")
+    box.type("GtkEntry", "Cellar")
+    box.press("gtk-yes")
     answer_encrypted("hidden treasure", remember=False, index=1)
     connected_to(5)
     followed("2", "3", "4")
@@ -164,8 +164,8 @@ def a_name_and_a_key_of_shell_characters():
 def two_access_points_of_one_name():
     w.refresh_until(lambda now: [one[0] for one in now].count("Twins") == 2, "both are listed")
     press_connect("Twins")
-    until(lambda: any(one[4].startswith("Connected\nIP Address:10.9.") and one[0] == "Twins"
-                      for one in w.rows()), "one of them gives an address", 90, 0.5)
+    wait_until(lambda: any(one[4].startswith("Connected\nIP Address:10.9.") and one[0] == "Twins"
+                           for one in w.rows()), "one of them to give an address", 90)
     w.idle()
     w.refresh_until(lambda now: [one[0] for one in now].count("Twins") == 2, "both are listed")
     state = [one[4] for one in w.rows() if one[0] == "Twins"]
@@ -176,7 +176,7 @@ def two_access_points_of_one_name():
 
 
 def the_window_closes_with_status_0():
-    same(w.end(), 0, "the status")
+    same(w.app.quit(), 0, "the status")
 
 
 SCENARIOS = [

@@ -1,9 +1,13 @@
+# SPDX-License-Identifier: MIT
 """A radio that appears after the program."""
 
 import air
 import window as w
-from air import network, until
+from air import network
 from steps import connected_to, press_connect, same
+
+NOT_FOUND = ("Can not found any WIFI device.\n"
+             "Please confim that you have a WIFI device (either built-in or USB WIFI).")
 
 
 def prepare():
@@ -11,10 +15,10 @@ def prepare():
 
 
 def without_a_radio_it_says_so():
-    box = w.dialog("No Wireless Device")
+    box = w.app.dialog(text="No Wireless Device")
     w.photograph("no-device")
-    w.press_in(box, "gtk-close")
-    w.gone(box)
+    box.press("gtk-close")
+    box.wait_gone()
     same(w.title(), "No Wireless Device", "the title")
     same(w.rows(), [], "the list")
 
@@ -22,21 +26,20 @@ def without_a_radio_it_says_so():
 def an_absent_radio_is_waited_for_and_missed():
     # The marker of a built-in radio: the program switches it on and looks again 6 s later.
     open("/etc/build_in_wifi", "w").close()
-    w.press(w.widget("button-active-device"))
-    w.dialog("Checking,please wait...")
-    box = w.dialog("Can not found any WIFI device.")
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
+    w.app.press("button-active-device")
+    w.app.dialog(text="Checking,please wait...")
+    box = w.app.dialog(text=NOT_FOUND)
+    box.press("gtk-ok")
+    box.wait_gone()
 
 
 def a_radio_that_appears_late_is_found():
-    w.press(w.widget("button-active-device"))
-    w.dialog("Checking,please wait...")
+    w.app.press("button-active-device")
+    checking = w.app.dialog(text="Checking,please wait...")
     air.radios(3)
     air.access_point(1, 1, [network(b"Market", net=1)])
     air.addresses(1)
-    until(lambda: not any("Checking,please wait..." in w.texts(one) for one in w.windows()),
-          "the checking window closes", 60)
+    checking.wait_gone(60)
     # The search began before the window closed.
     w.idle()
     press_connect("Market")

@@ -1,10 +1,12 @@
+# SPDX-License-Identifier: MIT
 """Addresses by hand, a network of one's own."""
 
 import re
 
 import air
 import window as w
-from air import FAR, network, run, until
+from air import FAR, network, run
+from probe import wait_until
 from steps import (check, connected_to, followed, open_settings, press_button, press_connect, same,
                    tick, wanted_row, write_addresses)
 
@@ -24,11 +26,11 @@ def static_addresses_reach_beyond_the_gateway():
     write_addresses(box, "10.9.1.77", "255.255.255.0", "10.9.1.255", "10.9.1.1")
     w.photograph("settings")
     w.notices()
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
-    until(lambda: "inet 10.9.1.77/24 brd 10.9.1.255" in
-          run("ip", "-4", "addr", "show", "dev", "wlan0"), "the address is set", 60)
-    until(lambda: "default via 10.9.1.1" in run("ip", "route"), "the gateway is set", 30)
+    box.press("gtk-ok")
+    box.wait_gone()
+    wait_until(lambda: "inet 10.9.1.77/24 brd 10.9.1.255" in
+               run("ip", "-4", "addr", "show", "dev", "wlan0"), "the address")
+    wait_until(lambda: "default via 10.9.1.1" in run("ip", "route"), "the gateway", 30)
     run("ping", "-c", "1", "-W", "10", air.BEYOND)
     followed("2", "4")
     w.idle()
@@ -39,26 +41,26 @@ def static_addresses_serve_a_network_without_any():
     box = open_settings()
     write_addresses(box, "10.9.9.77", "255.255.255.0", "10.9.9.255", "10.9.9.1")
     w.notices()
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
+    box.press("gtk-ok")
+    box.wait_gone()
     followed("2", "4")
     press_connect("Silence")
-    until(lambda: ["Silence", "Connected\nIP Address:10.9.9.77"] in
-          [[one[0], one[4]] for one in w.rows()], "the address", 90, 0.5)
-    until(lambda: "default via 10.9.9.1" in run("ip", "route"), "the gateway is set", 30)
+    wait_until(lambda: ["Silence", "Connected\nIP Address:10.9.9.77"] in
+               [[one[0], one[4]] for one in w.rows()], "the address", 90)
+    wait_until(lambda: "default via 10.9.9.1" in run("ip", "route"), "the gateway", 30)
     run("ping", "-c", "1", "-W", "10", air.BEYOND)
     followed("2", "3", "4")
     w.idle()
 
 
 def dhcp_again():
-    w.select_surely(wanted_row("Silence"))
+    w.select(wanted_row("Silence"))
     press_button("gtk-disconnect")
-    until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
+    wait_until(lambda: all(one[4] == "Disconnect" for one in w.rows()), "no row is connected")
     box = open_settings()
-    tick(box, "GtkRadioButton", "dhcp")
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
+    tick(box, "dhcpwlan0")
+    box.press("gtk-ok")
+    box.wait_gone()
     press_connect("Market")
     connected_to(1)
 
@@ -67,30 +69,30 @@ def an_invalid_address_is_refused():
     before = open("/etc/wireless.conf").read()
     box = open_settings()
     write_addresses(box, "10.9.1.300", "255.255.255.0", "10.9.1.255", "10.9.1.1")
-    w.press_in(box, "gtk-ok")
-    message = w.dialog("Settings invalid")
-    w.press_in(message, "gtk-ok")
-    w.gone(message)
-    w.press_in(box, "gtk-cancel")
-    w.gone(box)
+    box.press("gtk-ok")
+    message = w.app.dialog(text="Settings invalid")
+    message.press("gtk-ok")
+    message.wait_gone()
+    box.press("gtk-cancel")
+    box.wait_gone()
     same(open("/etc/wireless.conf").read(), before, "/etc/wireless.conf")
 
 
 def a_hosted_network_is_seen_and_joined_by_a_second_station():
     box = open_settings()
     write_addresses(box, "10.9.77.1", "255.255.255.0", "10.9.77.255", "10.9.77.1")
-    tick(box, "GtkCheckButton", "Ad-Hoc Host")
-    w.press_in(box, "gtk-preferences")
-    details = w.dialog("Ad-Hoc Information")
-    w.fill(w.find(details, "GtkEntry"), "Our own")
-    w.press_in(details, "gtk-ok")
-    w.gone(details)
+    tick(box, "adhoc-hostwlan0")
+    box.press("gtk-preferences")
+    details = w.app.dialog("Ad-Hoc Information")
+    details.type("GtkEntry", "Our own")
+    details.press("gtk-ok")
+    details.wait_gone()
     w.notices()
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
-    until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")
+    box.press("gtk-ok")
+    box.wait_gone()
+    wait_until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")
     followed("3")
-    check(not w.widget("button-connect")["usable"], "Connect is sensitive")
+    check(not w.app.find("button-connect")["usable"], "Connect is sensitive")
     w.photograph("hosting")
     run("ip", "link", "set", "wlan2", "up", netns=FAR)
 
@@ -99,25 +101,25 @@ def a_hosted_network_is_seen_and_joined_by_a_second_station():
         return any("SSID: Our own" in one and "IBSS" in one for one in found.split("BSS ")) or \
             ("SSID: Our own" in found and "IBSS" in found)
 
-    until(seen, "a second station sees it", 90, 1)
+    wait_until(seen, "a second station sees it", 90)
     run("ip", "link", "set", "wlan2", "down", netns=FAR)
     run("iw", "dev", "wlan2", "set", "type", "ibss", netns=FAR)
     run("ip", "link", "set", "wlan2", "up", netns=FAR)
     frequency = re.search(r"channel \d+ \((\d+) MHz", run("iw", "dev", "wlan0", "info")).group(1)
     run("iw", "dev", "wlan2", "ibss", "join", "Our own", frequency, netns=FAR)
     run("ip", "addr", "add", "10.9.77.2/24", "dev", "wlan2", netns=FAR)
-    until(lambda: "1 received" in run("ping", "-c", "1", "-W", "2", "10.9.77.1", netns=FAR,
-                                      check=False), "it answers", 60)
+    wait_until(lambda: "1 received" in run("ping", "-c", "1", "-W", "2", "10.9.77.1", netns=FAR,
+                                           check=False), "an answer to ping")
 
 
 def from_hosting_back_to_a_network():
     run("iw", "dev", "wlan2", "ibss", "leave", netns=FAR)
     box = open_settings()
-    tick(box, "GtkCheckButton", "Ad-Hoc Host", False)
-    tick(box, "GtkRadioButton", "dhcp")
-    w.press_in(box, "gtk-ok")
-    w.gone(box)
-    until(lambda: w.widget("button-refresh")["usable"], "the window is idle", 90)
+    tick(box, "adhoc-hostwlan0", False)
+    tick(box, "dhcpwlan0")
+    box.press("gtk-ok")
+    box.wait_gone()
+    wait_until(lambda: w.app.find("button-refresh")["usable"], "the window is idle", 90)
     w.refresh()
     press_connect("Market")
     connected_to(1)

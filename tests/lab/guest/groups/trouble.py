@@ -1,20 +1,17 @@
+# SPDX-License-Identifier: MIT
 """What goes wrong in the air."""
 
 import air
 import window as w
-from air import network, until
+from air import network
 from steps import (answer_encrypted, check, connected_to, followed, press_button, press_connect,
                    same, wanted_row)
 
-goer = None  # the access point that goes away and comes back
-
-
 def prepare():
-    global goer
     air.radios(5)
     air.access_point(1, 1, [network(b"Home Net", key="correct horse", net=2),
                             network(b"Silence")])
-    goer = air.access_point(2, 6, [network(b"Goer", net=3)])
+    air.access_point(2, 6, [network(b"Goer", net=3)])
     air.addresses(2, 3)
     w.begin()
     w.idle()
@@ -23,7 +20,7 @@ def prepare():
 def a_wrong_key_is_not_connected():
     row = press_connect("Home Net")
     answer_encrypted("wrong horse", remember=False, index=1)
-    until(lambda: w.rows()[row][4] == "Not Connect", "Not Connect", 120, 1)
+    w.app.wait_state(row, "Not Connect", 120)
     followed("2", "2")
     w.idle()
     w.photograph("wrong-key")
@@ -38,42 +35,39 @@ def the_right_key_after_it():
 
 def without_addresses_the_address_is_invalid():
     row = press_connect("Silence")
-    until(lambda: w.rows()[row][4] == "Connected\nAcquire IP address...", "the association", 60, 1)
-    until(lambda: w.rows()[row][4] == "Connected\nIP address invalid", "giving up", 120, 1)
+    w.app.wait_state(row, "Connected\nAcquire IP address...")
+    w.app.wait_state(row, "Connected\nIP address invalid", 120)
     followed("2", "3")
     w.idle()
-    same(w.widget("button-connect")["label"], "gtk-disconnect", "the button")
+    same(w.app.label("button-connect"), "gtk-disconnect", "the button")
     w.photograph("no-address")
 
 
 def an_access_point_that_goes_away():
     press_connect("Goer")
     connected_to(3)
-    goer.terminate()
-    goer.wait()
+    air.switch_off(2)
     # Its last beacons are remembered for half a minute.
     w.refresh_until(lambda now: "Goer" not in [one[0] for one in now], "it leaves the list")
     check(all(not one[4].startswith("Connected") for one in w.rows()), "a row is called connected")
-    check(w.alive(), "the program ended")
+    check(w.app.running(), "the program ended")
 
 
 def an_access_point_that_comes_back():
-    global goer
     # The supplicant goes on looking for its network; a refresh finds it joined again.
-    goer = air.access_point(2, 6, [network(b"Goer", net=3)])
+    air.access_point(2, 6, [network(b"Goer", net=3)])
     w.refresh_until(lambda now: any(one[0] == "Goer" and one[4].startswith("Connected\n")
                                     for one in now), "it is joined again")
 
 
 def an_access_point_that_is_gone_before_the_press():
-    passer = air.access_point(3, 11, [network(b"Passer", net=4)])
+    air.access_point(3, 11, [network(b"Passer", net=4)])
     row = wanted_row("Passer")
-    passer.terminate()
-    passer.wait()
-    w.select_surely(row)
+    air.switch_off(3)
+    w.select(row)
     w.notices()
     press_button("gtk-connect")
-    until(lambda: w.rows()[row][4] == "Not Connect", "Not Connect", 120, 1)
+    w.app.wait_state(row, "Not Connect", 120)
     followed("2", "2")
     w.idle()
 
