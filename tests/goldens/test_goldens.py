@@ -1,20 +1,24 @@
-#!/usr/bin/python3
-"""Works out the records that stand beside the inputs of this folder, by reading each input as a
-whole, without the program. Without arguments it compares them with the files; with --write it
-writes the files, to be read before they are committed.
+# SPDX-License-Identifier: MIT
+r"""The records beside the inputs of this directory, worked out from each input as a whole, without
+the program.
 
 scan/NAME.txt is the output of iwlist, scan/NAME.cells its networks; interfaces/NAME.txt is the
 kernel's list, interfaces/NAME.names its interfaces. Bytes that are no printable ASCII, and the
-backslash, stand as \\xNN. The inputs named real-... are the unchanged output of Wireless-Tools 30
-and of Linux 6.1 on simulated radios (mac80211_hwsim)."""
+backslash, are written as \xNN. The inputs named real-... are the unchanged output of Wireless-Tools
+30 and of Linux 6.1 on simulated radios (mac80211_hwsim).
+
+For a new input: pytest tests/goldens --write-goldens"""
 
 import pathlib
-import sys
+
+import pytest
+
+from support.grammar import INTERFACE_LINE, SPACES, pieces, read_interfaces, read_scan
 
 HERE = pathlib.Path(__file__).parent
-sys.path.insert(0, str(HERE.parent))
-from support.grammar import INTERFACE_LINE, SPACES, pieces, read_interfaces, read_scan  # noqa: E402
-
+INPUTS = sorted(HERE.glob("*/*.txt"))
+NETWORKS = 128
+INTERFACES = 16
 WIDTHS = {"address": 32, "essid": 128, "mode": 16, "frequency": 40, "quality": 16, "key": 4}
 
 
@@ -33,48 +37,45 @@ def fit(value, width):
     return value[:end]
 
 
-def shown(value):
-    return "".join(chr(b) if 32 <= b < 127 and b != 92 else "\\x%02x" % b for b in value)
+def shown(name, value):
+    text = "".join(chr(byte) if 32 <= byte < 127 and byte != 92 else f"\\x{byte:02x}"
+                   for byte in value)
+    return f"{name}: {text}".rstrip(" ")
 
 
-def scan(text):
-    networks = read_scan(text)[:128]
-    out = ["networks: %d" % len(networks)]
-    for found in networks:
-        out.append("")
+def networks_of(text):
+    networks = read_scan(text)[:NETWORKS]
+    lines = [f"networks: {len(networks)}"]
+    for network in networks:
+        lines.append("")
         for field, width in WIDTHS.items():
-            name = "channel" if field == "frequency" else field
-            value = shown(fit(found.get(field, b""), width))
-            out.append(("%s: %s" % (name, value)).rstrip(" "))
-        out.append("encmode: %d" % {None: 0, b"off": 0, b"on": 1}.get(found.get("key"), 2))
-    return out
+            lines.append(shown("channel" if field == "frequency" else field,
+                               fit(network.get(field, b""), width)))
+        lines.append(f"encmode: {({None: 0, b'off': 0, b'on': 1}).get(network.get('key'), 2)}")
+    return lines
 
 
-def interfaces(text):
+def interfaces_of(text):
     names = read_interfaces(text)
     if names is None:
         return ["interfaces: -1"]
-    count = min(len(names), 16)
-    # One slot more than there are lines holds what the last piece leaves in the buffer.
-    last = pieces(text, INTERFACE_LINE)[-1].split(b":")[0].strip(SPACES)
-    return ["interfaces: %d" % count] + [
-        ("name: %s" % shown(fit(name, 16))).rstrip(" ") for name in (names + [last])[:16]]
+    # The slot after the last interface holds what the last line read leaves in it.
+    left = pieces(text, INTERFACE_LINE)[-1].split(b":")[0].strip(SPACES)
+    return [f"interfaces: {min(len(names), INTERFACES)}"] + [
+        shown("name", fit(name, INTERFACES)) for name in (names + [left])[:INTERFACES]]
 
 
-def main():
-    wrong = []
-    inputs = sorted(HERE.glob("*/*.txt"))
-    for path in inputs:
-        rule, suffix = (scan, ".cells") if path.parent.name == "scan" else (interfaces, ".names")
-        text = "\n".join(rule(path.read_bytes())) + "\n"
-        target = path.with_suffix(suffix)
-        if "--write" in sys.argv:
-            target.write_text(text)
-        elif not target.exists() or target.read_text() != text:
-            wrong.append(target.name)
-    print("%d goldens, %d differ %s" % (len(inputs), len(wrong), " ".join(wrong)))
-    return 1 if wrong or not inputs else 0
+def test_there_are_inputs():
+    assert {path.parent.name for path in INPUTS} == {"scan", "interfaces"}
 
 
-if __name__ == "__main__":
-    sys.exit(main())
+@pytest.mark.parametrize("path", INPUTS, ids=lambda path: f"{path.parent.name}/{path.stem}")
+def test_records(path, request):
+    if path.parent.name == "scan":
+        lines, golden = networks_of(path.read_bytes()), path.with_suffix(".cells")
+    else:
+        lines, golden = interfaces_of(path.read_bytes()), path.with_suffix(".names")
+    text = "\n".join(lines) + "\n"
+    if request.config.getoption("--write-goldens"):
+        golden.write_text(text, encoding="ascii")
+    assert golden.read_text(encoding="ascii") == text

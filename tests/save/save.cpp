@@ -1,5 +1,6 @@
+// SPDX-License-Identifier: MIT
 // Saves one of the two files and nothing else: save basic|preferred FILE old|new|short. Exit status
-// 0: saved, 1: not saved, the cause stands on standard error.
+// 0: saved, 1: not saved, with the cause on standard error.
 
 #include <cstring>
 
@@ -32,7 +33,7 @@ int main(int argc, char **argv)
         fill(cell->alias, sizeof cell->alias, byte);
         fill(cell->essid, sizeof cell->essid, byte);
     }
-    getppid(); // the save begins behind this system call
+    getppid(); // the save begins after this system call
     bool basic = strcmp(argv[1], "basic") == 0;
     gboolean saved =
         basic ? save_basic_setting_to_file(argv[2]) : save_preferred_network_to_file(argv[2]);

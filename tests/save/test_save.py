@@ -1,6 +1,8 @@
+# SPDX-License-Identifier: MIT
 """Saves under bad luck: a kill or an error at every system call, full disks, foreign owners, mounts.
 
-Runs the program in SAVE_PROGRAM. What needs mounts runs in a mount namespace of its own."""
+Runs tests/save-program of the build directory WIRELESS_LAN_BUILD. What needs mounts runs in a mount
+namespace of its own."""
 
 import collections
 import os
@@ -13,18 +15,25 @@ import subprocess
 
 import pytest
 
-SAVE = os.environ["SAVE_PROGRAM"]
+BUILD = os.environ.get("WIRELESS_LAN_BUILD", pathlib.Path(__file__).parents[2] / "build")
+SAVE = pathlib.Path(BUILD).resolve() / "tests/save-program"
+# A leak cannot be looked for under strace.
+ENVIRONMENT = {**os.environ, "ASAN_OPTIONS": os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0"}
 KINDS = ["basic", "preferred"]
 ROOT = os.geteuid() == 0
 UNSHARE = ["unshare", "-m"] if ROOT else ["unshare", "-rm"]
 as_root = pytest.mark.skipif(not ROOT, reason="needs root")
 
 
+def run(*command):
+    """Runs a command; the finished process with its output as text."""
+    return subprocess.run([str(word) for word in command], env=ENVIRONMENT, capture_output=True,
+                          text=True, errors="replace", check=False)
+
+
 def save(kind, path, version, before=()):
     """Runs a save; (exit status, standard error)."""
-    done = subprocess.run(
-        [*before, SAVE, kind, str(path), version], capture_output=True, text=True, errors="replace"
-    )
+    done = run(*before, SAVE, kind, path, version)
     return done.returncode, done.stderr
 
 
@@ -43,7 +52,7 @@ def texts(tmp_path):
 
 
 def calls_of_a_save(kind, path, version, trace):
-    """(name, how many of that name so far) of each system call behind the marker."""
+    """(name, how many of that name so far) of each system call after the marker."""
     status, _ = save(kind, path, version, ["strace", "-qq", "-o", str(trace)])
     assert status == 0
     seen, calls, begun = collections.Counter(), [], False
@@ -167,10 +176,7 @@ def test_an_error_while_writing_in_place(kind, tmp_path, texts):
 
 def in_namespace(script, *arguments):
     """Runs a shell script with the folder of tests as $1 in a mount namespace; its output."""
-    done = subprocess.run(
-        [*UNSHARE, "sh", "-euc", script, "sh", *map(str, arguments)],
-        capture_output=True, text=True, errors="replace",
-    )
+    done = run(*UNSHARE, "sh", "-euc", script, "sh", *arguments)
     assert done.returncode == 0, done.stdout + done.stderr
     return done.stdout + done.stderr
 
@@ -308,7 +314,7 @@ def test_a_folder_of_another_user(kind, public_folder, texts):
     target = folder / "conf"
     target.write_bytes(texts[kind, "old"])
     os.chown(target, 1234, 1234)
-    done = subprocess.run([*as_user(1234), public_folder / "save", kind, target, "short"])
+    done = run(*as_user(1234), public_folder / "save", kind, target, "short")
     assert done.returncode == 0
     assert target.read_bytes() == texts[kind, "short"]
     assert target.stat().st_uid == 1234
@@ -325,8 +331,7 @@ def test_a_file_of_another_user(kind, public_folder, texts):
     for mode, saved in [(0o666, True), (0o644, False)]:
         target.write_bytes(texts[kind, "old"])
         target.chmod(mode)
-        done = subprocess.run([*as_user(1234), public_folder / "save", kind, target, "new"],
-                              capture_output=True, text=True)
+        done = run(*as_user(1234), public_folder / "save", kind, target, "new")
         assert (done.returncode == 0) == saved
         assert target.read_bytes() == texts[kind, "new" if saved else "old"]
         assert saved or f"{target}: Permission denied\n" in done.stderr
