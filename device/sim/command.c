@@ -132,7 +132,7 @@ static void pause_for(double seconds)
         continue;
 }
 
-// The scenario's own hook, else the one that every scenario has, else none.
+// The scenario's own hook, else the default one, else none.
 static void run_hook(char **argv)
 {
     char path[256];

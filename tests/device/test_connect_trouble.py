@@ -4,9 +4,9 @@ import os
 import resource
 import subprocess
 
-from connecting import (ACQUIRING, CONNECTING, IDLE, INVALID, LOCKED, address_of, arrive, children,
-                        connect, connected, idle, pass_time, poll_address, poll_link, refresh,
-                        settle, wait_commands)
+from connecting import (ACQUIRING, COMMANDS, CONNECTING, IDLE, INVALID, LOCKED, address_of, arrive,
+                        children, connect, connected, idle, pass_time, poll_address, poll_link,
+                        refresh, settle, wait_commands)
 from harness import wait_until
 from support.grammar import scan_text
 
@@ -56,6 +56,8 @@ def troubled(device, *networks):
     with open(source, "w", encoding="ascii") as file:
         file.write(LIBRARY)
     subprocess.run(["cc", "-shared", "-fPIC", "-O1", "-o", library, source], check=True)
+    for name in COMMANDS:
+        d.command(name, hook=":")
     app = d.start(environment={"LD_PRELOAD": library})
     app.wait_listed()
     d.clock.rate = 0
