@@ -1,7 +1,7 @@
+// SPDX-License-Identifier: MIT
 // A random user works the preferred networks through the program's own callbacks and dialogs, and a
 // simple model of the list says after every step what rows, selection, records and file must be.
-//
-//   test_preferred_model [SEQUENCES [SEED]]
+// SEQUENCES and SEED in the environment say how many sequences run and which is the first.
 
 #include <cstdarg>
 #include <cstdio>
@@ -10,14 +10,17 @@
 #include <string>
 #include <vector>
 
+#include <gtest/gtest.h>
 #include <gtk/gtk.h>
-#include <unistd.h>
 
 #include "base/registry.h"
 #include "base/state.h"
 #include "preferred/list_dialog.h"
 #include "preferred/store.h"
+#include "support/model.h"
 #include "wifi.h"
+#include "wifi_info/preferred_file.h"
+#include "wifi_info/replace_file.h"
 #include "wifi_info/text.h"
 
 using std::string;
@@ -40,6 +43,7 @@ static const char *const enc_names[] = {"ENC_OFF", "ENC_OPEN", "ENC_RESTRICTED"}
 static std::vector<network> rows;  // what the two lists must hold
 static std::vector<network> saved; // what the records must hold
 static string file_text;           // what the file must hold
+static string written;             // what the program wrote to it
 static int selected;
 static gboolean file_fails; // the next save cannot be written
 
@@ -48,7 +52,6 @@ static gboolean file_fails; // the next save cannot be written
 static FILE *report; // standard error; the program's own lines go nowhere
 static guint sequence_seed;
 static string history;
-static string user_file;
 static guint steps;
 
 static void note(const char *format, ...) G_GNUC_PRINTF(1, 2);
@@ -67,7 +70,7 @@ static void note(const char *format, ...)
 {
     fprintf(report, "%s is \"%s\", must be \"%s\"\nafter, with seed %u:%s\n", what, is.c_str(),
             wanted.c_str(), sequence_seed, history.c_str());
-    unlink(user_file.c_str());
+    // A dialog may be open: there is no way back from here.
     exit(EXIT_FAILURE);
 }
 
@@ -169,29 +172,24 @@ static string shown(const network &one)
     return valid(one.alias.empty() ? one.essid : one.alias);
 }
 
-static string one_line(string text)
+static guint32 number(const string &text)
 {
-    for (char &byte : text)
-        if (byte == '\n' || byte == '\r')
-            byte = ' ';
-    return text;
+    return static_cast<guint32>(atoi(text.c_str()));
+}
+
+static t_encmode encryption(const network &one)
+{
+    return one.enc == "ENC_OFF" ? ENC_OFF : one.enc == "ENC_OPEN" ? ENC_OPEN : ENC_RESTRICTED;
 }
 
 static string file_of(const std::vector<network> &networks)
 {
-    static const char *const words[] = {"off", "open", "restricted"};
-    string text;
+    std::vector<model::preferred> records;
 
-    for (size_t i = 0; i < networks.size(); i++) {
-        const network &one = networks[i];
-        const int enc = one.enc == "ENC_OFF" ? 0 : one.enc == "ENC_OPEN" ? 1 : 2;
-
-        text += "USERCELL " + std::to_string(i) + "\nALIAS " + one_line(one.alias) + "\nESSID " +
-                one_line(one.essid) + "\nMODE " + one.mode + "\nKMGMT " + one.key_mgmt +
-                "\nKINDEX " + one.key_index + "\nEncryption " + words[enc] + "\nKEY " +
-                (enc == 0 ? "off" : one_line(one.key)) + "\n";
-    }
-    return text;
+    for (const network &one : networks)
+        records.push_back({one.alias, one.essid, one.mode, one.key, number(one.key_mgmt),
+                           number(one.key_index), encryption(one)});
+    return model::write_preferred(records);
 }
 
 static std::vector<network> cut(std::vector<network> networks)
@@ -255,8 +253,6 @@ static void check_highlight()
 
 static void check_saved()
 {
-    g_autofree gchar *content = nullptr;
-
     expect("the number of records", my_wifi->user_cell_count, static_cast<int>(saved.size()));
     for (size_t i = 0; i < saved.size(); i++) {
         const WIFI_CELL *record = my_wifi->user_wifi_cell[i];
@@ -270,8 +266,7 @@ static void check_saved()
         expect("the record's key management", std::to_string(record->key_mgmt), one.key_mgmt);
         expect("the record's key index", std::to_string(record->key_index), one.key_index);
     }
-    g_file_get_contents(user_file.c_str(), &content, nullptr, nullptr);
-    expect("the file", content != nullptr ? content : "", file_text);
+    expect("the file", written, file_text);
 }
 
 // --- hands --------------------------------------------------------------------------------------
@@ -501,9 +496,9 @@ static void check_refused(const char *warning, const string &before)
     }
 }
 
-// A refused attempt without an ESSID leaves the front list behind until the next good one.
-static gboolean front_behind;
-static string front_behind_text;
+// A refused attempt without an ESSID leaves the front list as it was until the next good one.
+static gboolean front_stale;
+static string stale_text;
 
 static void use_form()
 {
@@ -523,15 +518,15 @@ static void use_form()
     note("ok(%s)", warning != nullptr ? warning : "");
     if (warning != nullptr) {
         if (names == &edit_names)
-            front_behind = string(warning) == "Please enter the ESSID.";
-        front_behind_text = before;
+            front_stale = string(warning) == "Please enter the ESSID.";
+        stale_text = before;
         then([warning, before] {
             check_refused(warning, before);
             then(use_form);
             dismiss(warning);
         });
     } else {
-        front_behind = FALSE;
+        front_stale = FALSE;
     }
     answer(GTK_RESPONSE_OK);
 }
@@ -570,14 +565,14 @@ static void edit()
     form.adhoc = one.mode == "Ad-Hoc";
     form.enc = form.wpa || one.enc == "ENC_OPEN" ? 1 : one.enc == "ENC_OFF" ? 0 : 2;
     form.key_index = one.key_index.size() == 1 && one.key_index < "4" ? one.key_index[0] - '0' : 0;
-    front_behind = FALSE;
+    front_stale = FALSE;
     then(use_form);
     press("preferred_button_properties");
-    if (!front_behind)
+    if (!front_stale)
         return;
     // The rest of this test compares names; here the row is left as the user left it, with the
     // former name still shown.
-    expect("the shown name", cell(FRONT_KEY, static_cast<size_t>(selected), 0), front_behind_text);
+    expect("the shown name", cell(FRONT_KEY, static_cast<size_t>(selected), 0), stale_text);
     gtk_clist_set_text(GTK_CLIST(find_widget(FRONT_KEY)), selected, 0,
                        shown(rows[static_cast<size_t>(selected)]).c_str());
 }
@@ -744,17 +739,14 @@ static void start_up()
         g_strlcpy(record->essid, one.essid.c_str(), sizeof record->essid);
         g_strlcpy(record->mode, one.mode.c_str(), sizeof record->mode);
         g_strlcpy(record->userkey, one.key.c_str(), sizeof record->userkey);
-        record->encmode = one.enc == "ENC_OFF"    ? ENC_OFF
-                          : one.enc == "ENC_OPEN" ? ENC_OPEN
-                                                  : ENC_RESTRICTED;
-        record->key_mgmt = static_cast<guint32>(atoi(one.key_mgmt.c_str()));
-        record->key_index = static_cast<guint32>(atoi(one.key_index.c_str()));
+        record->encmode = encryption(one);
+        record->key_mgmt = number(one.key_mgmt);
+        record->key_index = number(one.key_index);
         my_wifi->user_wifi_cell[i] = record;
     }
     my_wifi->user_cell_count = count;
     saved = rows;
-    file_text = file_of(saved);
-    g_file_set_contents(user_file.c_str(), file_text.c_str(), -1, nullptr);
+    written = file_text = file_of(saved);
     selected = -1;
     global_build_list = build_user_cell_clist();
 }
@@ -812,42 +804,71 @@ static void check_growth()
     }
 }
 
-extern "C" {
-// The program's writer.
-gboolean __real__Z30save_preferred_network_to_filePKc(const gchar *file);
-
-gboolean __wrap__Z30save_preferred_network_to_filePKc(const gchar *file)
+// Stand in for the program's own: the file is a text.
+gboolean replace_file(const char *path, const char *content, gsize length, GError **error)
 {
-    expect("the file's name", file, "/etc/wireless-user.conf");
-    return __real__Z30save_preferred_network_to_filePKc(file_fails ? "/nowhere/wireless-user.conf"
-                                                                   : user_file.c_str());
-}
+    expect("the file's name", path, USER_FILE);
+    if (file_fails) {
+        g_set_error(error, G_FILE_ERROR, G_FILE_ERROR_NOSPC, "No space left on device");
+        return FALSE;
+    }
+    written.assign(content, length);
+    return TRUE;
 }
 
-int main(int argc, char **argv)
+// No file here is one that could not be read whole.
+gboolean keep_old_file(const char *path, GError **)
 {
-    gtk_init(&argc, &argv);
+    fail("the file to keep", path, "none");
+}
 
-    const int sequences = argc > 1 ? atoi(argv[1]) : 2000;
-    const guint first_seed = argc > 2 ? static_cast<guint>(atoi(argv[2])) : 1;
-    g_autofree gchar *name = nullptr;
+static int from_environment(const char *name, int otherwise)
+{
+    const gchar *value = g_getenv(name);
 
-    close(g_file_open_tmp("wireless-user-XXXXXX", &name, nullptr));
-    user_file = name;
-    report = stderr;
-    stderr = fopen("/dev/null", "w");
-    stdout = stderr;
-    g_log_set_default_handler(log_is_failure, nullptr);
-    my_wifi_init();
-    mainwindow = gtk_window_new(GTK_WINDOW_TOPLEVEL);
+    return value != nullptr ? atoi(value) : otherwise;
+}
+
+struct PreferredModel : testing::Test {
+    FILE *output = stdout;
+
+    static void SetUpTestSuite()
+    {
+        gtk_init(nullptr, nullptr);
+        report = stderr;
+        g_log_set_default_handler(log_is_failure, nullptr);
+        my_wifi_init();
+        mainwindow = gtk_window_new(GTK_WINDOW_TOPLEVEL);
+    }
+
+    void SetUp() override
+    {
+        stdout = stderr = fopen("/dev/null", "w");
+    }
+
+    void TearDown() override
+    {
+        fclose(stderr);
+        stdout = output;
+        stderr = report;
+    }
+};
+
+TEST_F(PreferredModel, RandomSequences)
+{
+    const int sequences = from_environment("SEQUENCES", 2000);
+    const auto first_seed = static_cast<guint>(from_environment("SEED", 1));
+
     for (int i = 0; i < sequences; i++) {
         sequence_seed = first_seed + static_cast<guint>(i);
         chance = g_rand_new_with_seed(sequence_seed);
         run_sequence();
         g_rand_free(chance);
     }
-    check_growth();
-    unlink(user_file.c_str());
     fprintf(report, "%d sequences, %u steps\n", sequences, steps);
-    return EXIT_SUCCESS;
+}
+
+TEST_F(PreferredModel, OpeningsLeaveNoWidget)
+{
+    check_growth();
 }
