@@ -4,8 +4,12 @@
 // The file /device/state/ap holds "MAC [AFTER [COUNT]]": the access point, how many requests still
 // find nobody, and for how many requests it then stays. No file: not associated, which drivers
 // report as success with an address of zeros. The count starts anew when the file is replaced.
+//
+// The file /device/state/ap-error holds the number of an error with which the request fails, as on
+// a kernel without wireless extensions for the card.
 #define _GNU_SOURCE
 #include <dlfcn.h>
+#include <errno.h>
 #include <linux/if_arp.h>
 #include <linux/wireless.h>
 #include <stdarg.h>
@@ -41,6 +45,21 @@ static void read_access_point(unsigned char mac[6])
         memcpy(mac, read, sizeof read);
 }
 
+// Whether the request is to fail; errno says with what.
+static int refused(void)
+{
+    int error = 0;
+    FILE *file = fopen("/device/state/ap-error", "re");
+
+    if (file == NULL)
+        return 0;
+    if (fscanf(file, "%d", &error) != 1)
+        error = 0;
+    fclose(file);
+    errno = error;
+    return error != 0;
+}
+
 int ioctl(int fd, unsigned long request, ...)
 {
     static int (*next)(int, unsigned long, ...);
@@ -59,6 +78,8 @@ int ioctl(int fd, unsigned long request, ...)
     memset(&known, 0, sizeof known);
     memcpy(known.ifr_name, wireless->ifr_ifrn.ifrn_name, IFNAMSIZ);
     if (next(fd, SIOCGIFINDEX, &known) != 0)
+        return -1;
+    if (refused())
         return -1;
     unsigned char mac[6] = {0};
     read_access_point(mac);

@@ -24,11 +24,12 @@ def connected(ip):
 
 def idle(device, *networks, **settings):
     """A device with these networks in the list, nothing under way, and its commands without hooks."""
-    environment = settings.pop("environment", {})
+    start = {name: settings.pop(name) for name in ("environment", "device_path")
+             if name in settings}
     d = device("none", rate=50, scan=scan_text(*networks), **settings)
     for name in COMMANDS:
         d.command(name, hook=":")
-    app = d.start(environment=environment)
+    app = d.start(**start)
     app.wait_listed()
     d.clock.rate = 0
     return d, app

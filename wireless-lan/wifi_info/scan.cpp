@@ -9,6 +9,7 @@
 #include "wifi.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/encryption.h"
+#include "wifi_info/device.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
@@ -115,6 +116,20 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
     return FALSE;
 }
 
+// WEP or WPA, where the device says it; a board's own tool has no such line.
+static gboolean take_authentication(char *line, WIFI_CELL *cell)
+{
+    if (!has_device_path() || cell->encmode != ENC_OPEN)
+        return FALSE;
+
+    g_autofree gchar *word = get_string_value(line, "Authentication:", 0);
+
+    if (!word)
+        return FALSE;
+    cell->key_mgmt = g_str_equal(word, "WPA");
+    return TRUE;
+}
+
 // Reads from the network's first line to its "Bit Rates:" line. A network without one goes on into
 // the lines of the next, which fill what is still missing.
 static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
@@ -122,7 +137,7 @@ static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
     gboolean keywords_used[G_N_ELEMENTS(VALUES)] = {};
 
     do {
-        if (take_value(line, keywords_used, cell))
+        if (take_value(line, keywords_used, cell) || take_authentication(line, cell))
             continue;
 
         g_autofree gchar *bit_rates = get_string_value(line, "Bit Rates:", 0);

@@ -108,11 +108,15 @@ class Device:
         shutil.rmtree(self.state, ignore_errors=True)
 
     # The program.
-    def start(self, *arguments, wait=True, environment=None):
-        """Starts it, and waits for its window."""
+    def start(self, *arguments, wait=True, environment=None, device_path=False):
+        """Starts it, and waits for its window. `device_path`: the program as it is built for a
+        device that has a directory of commands, /usr/lib/wireless-lan/device."""
         number = len(self.apps)
         program = os.path.abspath(os.environ.get(
             "WIRELESS_LAN", f"{TOP}/build/wireless-lan/wireless-lan"))
+        if device_path:
+            program = os.path.abspath(os.environ.get("WIRELESS_LAN_BUILD", f"{TOP}/build") +
+                                      "/tests/with-device-path")
         assert os.path.exists(program), f"{program} is not built"
         settings = {
             "DISPLAY": self.display.name, "HOME": "/device/state/home", "LANG": "C.UTF-8",

@@ -3,11 +3,13 @@
 #include <initializer_list>
 
 static void run_message(GtkWidget *parent, GtkDialogFlags flags, GtkButtonsType buttons,
-                        const gchar *message)
+                        const gchar *message, const gchar *explanation)
 {
     GtkWidget *dialog = begin_dialog(gtk_message_dialog_new(
         GTK_WINDOW(parent), flags, GTK_MESSAGE_INFO, buttons, "%s", message));
 
+    if (explanation != nullptr)
+        gtk_message_dialog_format_secondary_text(GTK_MESSAGE_DIALOG(dialog), "%s", explanation);
     gtk_dialog_run(GTK_DIALOG(dialog));
     end_dialog(dialog);
 }
@@ -16,12 +18,17 @@ void show_message_box(GtkWidget *parent, const gchar *message)
 {
     run_message(parent,
                 static_cast<GtkDialogFlags>(GTK_DIALOG_MODAL | GTK_DIALOG_DESTROY_WITH_PARENT),
-                GTK_BUTTONS_OK, message);
+                GTK_BUTTONS_OK, message, nullptr);
 }
 
 void show_warring_dialog(GtkWidget *parent, const gchar *message)
 {
-    run_message(parent, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_BUTTONS_CLOSE, message);
+    show_explained_warning(parent, message, nullptr);
+}
+
+void show_explained_warning(GtkWidget *parent, const gchar *message, const gchar *explanation)
+{
+    run_message(parent, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_BUTTONS_CLOSE, message, explanation);
 }
 
 GtkWidget *begin_dialog(GtkWidget *dialog)

@@ -11,6 +11,9 @@ void show_message_box(GtkWidget *parent, const gchar *message);
 // The same with one Close button.
 void show_warring_dialog(GtkWidget *parent, const gchar *message);
 
+// The same with a second, smaller text below the first; NULL: none.
+void show_explained_warning(GtkWidget *parent, const gchar *message, const gchar *explanation);
+
 // Runs `dialog` as gtk_dialog_run does. The caller keeps the dialog until end_dialog, even when it
 // is destroyed meanwhile with its parent; the answer is then GTK_RESPONSE_NONE.
 GtkWidget *begin_dialog(GtkWidget *dialog);

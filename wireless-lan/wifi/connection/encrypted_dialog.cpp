@@ -12,6 +12,7 @@
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/device.h"
 #include "wifi_info/text.h"
 
 static const guint PADDING = 5;
@@ -79,7 +80,10 @@ GtkWidget *create_Authentication_ComboBox()
         return invalid_widget();
 
     GtkWidget *combo = text_combo({"WEP", "WPA-PSK/WPA2-PSK"});
+    const WIFI_CELL *cell = scanned_cell(connect_index);
 
+    if (has_device_path() && cell != nullptr)
+        gtk_combo_box_set_active(GTK_COMBO_BOX(combo), static_cast<gint>(cell->key_mgmt));
     for (int row = next_match(backend, 0); row >= 0; row = next_match(backend, row + 1)) {
         const gchar *number = clist_text(backend, row, LIST_KEY_MGMT);
 

@@ -17,6 +17,7 @@
 #include "base/state.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/device.h"
 #include "wifi_info/text.h"
 
 // Puts a request for the interface that it names to the kernel. FALSE: errno says why.
@@ -42,6 +43,20 @@ static gboolean request_address(const char *name, struct ifreq *request)
     return ask_kernel(SIOCGIFADDR, request);
 }
 
+// Whether the kernel has no wireless extensions for the card, as for multi-link ones since 6.3.
+static gboolean unsupported(int error)
+{
+    return error == EOPNOTSUPP || error == ENOTTY || error == EINVAL;
+}
+
+static gboolean interface_exists(const char *name)
+{
+    struct ifreq request = {};
+
+    copy_field(request.ifr_name, sizeof request.ifr_name, name);
+    return ask_kernel(SIOCGIFINDEX, &request);
+}
+
 void get_ap_mac()
 {
     // Kept for the next poll: this runs every two seconds of a connect.
@@ -55,14 +70,16 @@ void get_ap_mac()
     if (fd < 0)
         fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
     copy_field(request.ifr_name, sizeof request.ifr_name, iface->name);
-    if (ioctl(fd, SIOCGIWAP, &request) != 0)
+    if (ioctl(fd, SIOCGIWAP, &request) == 0) {
+        unsigned char mac[6];
+
+        memcpy(mac, request.u.ap_addr.sa_data, sizeof mac);
+        g_snprintf(Link_AP_MAC, sizeof Link_AP_MAC, "%02X:%02X:%02X:%02X:%02X:%02X", mac[0], mac[1],
+                   mac[2], mac[3], mac[4], mac[5]);
+    } else if (!unsupported(errno) || !interface_exists(iface->name) ||
+               !ask_ap_address(iface->name, Link_AP_MAC, sizeof Link_AP_MAC)) {
         return;
-
-    unsigned char mac[6];
-
-    memcpy(mac, request.u.ap_addr.sa_data, sizeof mac);
-    g_snprintf(Link_AP_MAC, sizeof Link_AP_MAC, "%02X:%02X:%02X:%02X:%02X:%02X", mac[0], mac[1],
-               mac[2], mac[3], mac[4], mac[5]);
+    }
     debug_line("Detect Linked Acess Pointer:%s", Link_AP_MAC);
 }
 

@@ -6,6 +6,7 @@
 #include <glib/gi18n.h>
 
 #include "base/desktop.h"
+#include "base/dialogs.h"
 #include "base/network_list.h"
 #include "base/registry.h"
 #include "base/state.h"
@@ -13,6 +14,7 @@
 #include "connection/interface_state.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/device.h"
 #include "wifi_info/interfaces.h"
 
 static const int POLL_LIMIT = 21;
@@ -41,6 +43,15 @@ void give_controls_back()
 {
     connect_button_sensitive(TRUE);
     doubleclick = TRUE;
+}
+
+// The status text says that a connect has failed; a device that knows why has a word of its own.
+static void tell_reason()
+{
+    g_autofree gchar *reason = device_reason();
+
+    if (reason != nullptr)
+        show_warring_dialog(mainwindow, reason);
 }
 
 gboolean detect_network_interface_state(gpointer)
@@ -75,6 +86,7 @@ gboolean detect_network_interface_state(gpointer)
     if (selected != nullptr && is_associated(selected->address))
         set_connect_label(GTK_STOCK_DISCONNECT);
     give_controls_back();
+    tell_reason();
     return FALSE;
 }
 
@@ -104,6 +116,7 @@ static void give_up_link()
     set_title_label("Wireless network selection");
     // doubleclick stays as it is: after a failure only the button connects again.
     connect_button_sensitive(TRUE);
+    tell_reason();
 }
 
 gboolean detect_network_link_state(gpointer)

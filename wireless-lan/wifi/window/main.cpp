@@ -3,29 +3,19 @@
 
 #include <glib/gi18n.h>
 #include <gtk/gtk.h>
+#include <unistd.h>
 
 #include "base/desktop.h"
+#include "base/dialogs.h"
 #include "base/state.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/device.h"
 #include "window/activation.h"
 #include "window/main_window.h"
 
 static const char TEXT_DOMAIN[] = "wireless-lan";
 // A window that is not shown (started as an icon) still gets its first scan.
 static const guint UNSEEN_MS = 1000;
-
-static void prepend_device_path()
-{
-    const char *path = g_getenv("PATH");
-
-    if (PROGRAM_DEVICE_PATH[0] == '\0')
-        return;
-
-    g_autofree gchar *longer =
-        g_strconcat(PROGRAM_DEVICE_PATH, ":", path != nullptr ? path : "/bin:/usr/bin", nullptr);
-
-    g_setenv("PATH", longer, TRUE);
-}
 
 static void cb_leave(GtkWidget *, gpointer)
 {
@@ -35,6 +25,17 @@ static void cb_leave(GtkWidget *, gpointer)
 
 static guint unseen_timer = 0; // 0: it has fired or is not needed any more
 
+// The commands of a device that tells reasons are for root alone.
+static void tell_missing_rights()
+{
+    if (!has_device_path() || geteuid() == 0)
+        return;
+
+    g_autofree gchar *reason = reason_sentence("not-root");
+
+    show_warring_dialog(mainwindow, reason);
+}
+
 // Queues the jobs behind the first picture, since the scan blocks the window. What became visible
 // was exposed at the same time, so after a round trip to the X server the exposures are here, and
 // they are drawn before idle jobs run.
@@ -42,6 +43,7 @@ static gboolean start_jobs(gpointer)
 {
     unseen_timer = 0;
     gdk_display_sync(gdk_display_get_default());
+    tell_missing_rights();
     g_idle_add(
         [](gpointer) -> gboolean {
             cb_active_device(nullptr, nullptr);
@@ -69,7 +71,7 @@ int main(int argc, char **argv)
 {
     // In a pipe, too, a line leaves when it is written.
     setvbuf(stdout, nullptr, _IOLBF, 0);
-    prepend_device_path();
+    set_device_path(PROGRAM_DEVICE_PATH);
     bindtextdomain(TEXT_DOMAIN, PROGRAM_LOCALEDIR);
     textdomain(TEXT_DOMAIN);
     bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");

@@ -14,6 +14,7 @@
 #include "connection/interface_state.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+#include "wifi_info/device.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/scan.h"
 #include "wifi_info/text.h"
@@ -93,7 +94,10 @@ gboolean cb_refresh(gpointer)
     my_wifi->cell_index = -1;
     if (my_wifi->cell_count < 1) {
         set_title_label(_("No Network"));
-        show_warring_dialog(mainwindow, _("No Network"));
+
+        g_autofree gchar *reason = device_reason();
+
+        show_explained_warning(mainwindow, _("No Network"), reason);
         set_title_label(_("Wireless network selection"));
         return FALSE;
     }
