@@ -8,8 +8,8 @@
 
 #include "wifi.h"
 #include "wifi_info/debug.h"
-#include "wifi_info/encryption.h"
 #include "wifi_info/device.h"
+#include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
