@@ -2,6 +2,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/registry.h"
 #include "base/state.h"
 #include "wifi.h"
 #include "wifi_info/text.h"
@@ -25,7 +26,7 @@ static GtkListStore *cell_list()
 {
     if (mainwindow == nullptr)
         return nullptr;
-    return static_cast<GtkListStore *>(g_object_get_data(G_OBJECT(mainwindow), "cell-list"));
+    return static_cast<GtkListStore *>(g_object_get_data(G_OBJECT(mainwindow), NETWORK_ROWS));
 }
 
 void clear_network_list()

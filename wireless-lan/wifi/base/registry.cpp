@@ -39,9 +39,15 @@ void set_widget_sensitive(const char *key, gboolean sensitive)
         gtk_widget_set_sensitive(widget, sensitive);
 }
 
+void set_widgets_sensitive(const char *const *keys, gboolean sensitive)
+{
+    for (; *keys != nullptr; keys++)
+        set_widget_sensitive(*keys, sensitive);
+}
+
 void set_title_label(const gchar *text)
 {
-    GtkWidget *label = find_widget("title-label");
+    GtkWidget *label = find_widget(TITLE_LABEL);
 
     if (label != nullptr)
         gtk_label_set_text(GTK_LABEL(label), text);
@@ -49,7 +55,7 @@ void set_title_label(const gchar *text)
 
 void set_connect_label(const gchar *stock)
 {
-    GtkWidget *button = find_widget("button-connect");
+    GtkWidget *button = find_widget(CONNECT_BUTTON);
 
     if (button != nullptr)
         gtk_button_set_label(GTK_BUTTON(button), stock);

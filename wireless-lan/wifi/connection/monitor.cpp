@@ -1,7 +1,6 @@
 #include "connection/monitor.h"
 
 #include <cstring>
-#include <initializer_list>
 
 #include <glib/gi18n.h>
 
@@ -21,11 +20,9 @@ static const int POLL_LIMIT = 21;
 
 void connect_button_sensitive(gboolean flags)
 {
-    for (const char *key :
-         {"button-network-configure", "button-connect", "button-wifi-settings", "button-refresh"})
-        set_widget_sensitive(key, flags);
+    set_widgets_sensitive(CONNECT_CONTROLS, flags);
     get_interface();
-    set_widget_sensitive("button-active-device", my_wifi->interface_count == 0);
+    set_widget_sensitive(ACTIVATE_BUTTON, my_wifi->interface_count == 0);
 }
 
 static void show_address()

@@ -3,7 +3,6 @@
 #include <arpa/inet.h>
 #include <cerrno>
 #include <cstdio>
-#include <initializer_list>
 
 #include <glib/gi18n.h>
 
@@ -85,16 +84,10 @@ static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gb
         *state = gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(check));
 }
 
-static void set_list_sensitive(gboolean sensitive)
-{
-    for (const char *key : {"view-press", "button-connect", "button-refresh"})
-        set_widget_sensitive(key, sensitive);
-}
-
 static void enter_host_mode(const WIFI_INTERFACE *iface)
 {
     host_network(iface);
-    set_list_sensitive(FALSE);
+    set_widgets_sensitive(LIST_CONTROLS, FALSE);
     set_title_label(_("Ad-Hoc Host Mode"));
     send_status_to_desktop(STATUS_ASSOCIATED);
 }
@@ -102,7 +95,7 @@ static void enter_host_mode(const WIFI_INTERFACE *iface)
 // FALSE: there is no association, so no address to ask for.
 static gboolean enter_selection_mode()
 {
-    set_list_sensitive(TRUE);
+    set_widgets_sensitive(LIST_CONTROLS, TRUE);
     set_title_label(_("Wireless network selection"));
     send_status_to_desktop(STATUS_DISCONNECTED);
     if (my_wifi->cell_count < 1)

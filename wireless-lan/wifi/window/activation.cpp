@@ -62,8 +62,8 @@ gboolean cb_check_wifi(gpointer)
                            "device (either built-in or USB WIFI)."));
         return FALSE;
     }
-    if (find_widget("button-active-device") != nullptr) {
-        set_widget_sensitive("button-active-device", FALSE);
+    if (find_widget(ACTIVATE_BUTTON) != nullptr) {
+        set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
         cb_refresh_network(nullptr, nullptr);
     }
     return FALSE;

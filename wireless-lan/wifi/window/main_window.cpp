@@ -51,13 +51,13 @@ GtkWidget *create_left_text()
 
     load_configuration();
 
-    add_button(table, 0, 2, 1, gtk_button_new_from_stock(GTK_STOCK_REFRESH), "button-refresh",
+    add_button(table, 0, 2, 1, gtk_button_new_from_stock(GTK_STOCK_REFRESH), REFRESH_BUTTON,
                G_CALLBACK(cb_refresh_network));
-    add_button(table, 0, 2, 3, gtk_button_new_with_label(_("WLAN Setting")), "button-wifi-settings",
+    add_button(table, 0, 2, 3, gtk_button_new_with_label(_("WLAN Setting")), SETTINGS_BUTTON,
                G_CALLBACK(cb_wifi_settings));
-    add_button(table, 0, 2, 5, gtk_button_new_with_label(_("Preferred Network")),
-               "button-network-configure", G_CALLBACK(cb_preferred_network_setting));
-    add_button(table, 0, 2, 7, gtk_button_new_with_label(_("Active WIFI")), "button-active-device",
+    add_button(table, 0, 2, 5, gtk_button_new_with_label(_("Preferred Network")), PREFERRED_BUTTON,
+               G_CALLBACK(cb_preferred_network_setting));
+    add_button(table, 0, 2, 7, gtk_button_new_with_label(_("Active WIFI")), ACTIVATE_BUTTON,
                G_CALLBACK(cb_active_device));
     gtk_widget_show_all(scrolled);
     return scrolled;
@@ -95,22 +95,22 @@ GtkWidget *create_list()
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), box);
     gtk_widget_set_size_request(scrolled, LIST_SIDE_WIDTH, 500);
 
-    register_named_widget(label, "title-label");
+    register_named_widget(label, TITLE_LABEL);
     gtk_misc_set_alignment(GTK_MISC(label), 0, 0);
     gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
 
     gtk_box_pack_start(GTK_BOX(box), list_scrolled, TRUE, TRUE, 0);
-    register_named_widget(view, "view-press");
+    register_named_widget(view, NETWORK_VIEW);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(list_scrolled), view);
     arrange_tree_view(view);
     g_signal_connect(view, "button-press-event", G_CALLBACK(cb_view_sel), nullptr);
 
-    g_object_set_data(G_OBJECT(mainwindow), "cell-list", model);
+    g_object_set_data(G_OBJECT(mainwindow), NETWORK_ROWS, model);
     gtk_tree_view_set_model(GTK_TREE_VIEW(view), model);
     g_object_unref(model);
     my_wifi->wifi_view = view;
 
-    add_button(table, 4, 6, 0, gtk_button_new_from_stock(GTK_STOCK_CONNECT), "button-connect",
+    add_button(table, 4, 6, 0, gtk_button_new_from_stock(GTK_STOCK_CONNECT), CONNECT_BUTTON,
                G_CALLBACK(cb_connect));
     gtk_box_pack_start(GTK_BOX(box), table, FALSE, FALSE, 0);
     gtk_widget_show_all(scrolled);

@@ -2,7 +2,6 @@
 
 #include <cstdio>
 #include <cstring>
-#include <initializer_list>
 
 #include <glib/gi18n.h>
 
@@ -26,8 +25,7 @@ gboolean cb_refresh_network(GtkWidget *, gpointer)
 {
     debug_line("Searching...");
     if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
-        for (const char *key : {"view-press", "button-connect", "button-refresh"})
-            set_widget_sensitive(key, FALSE);
+        set_widgets_sensitive(LIST_CONTROLS, FALSE);
         set_title_label(_("Ad-Hoc Host Mode"));
         return FALSE;
     }
@@ -43,9 +41,8 @@ gboolean cb_refresh_network(GtkWidget *, gpointer)
     }
 
     clear_network_list();
-    for (const char *key : {"button-network-configure", "button-connect", "button-wifi-settings",
-                            "button-refresh", "view-press", "button-active-device"})
-        set_widget_sensitive(key, FALSE);
+    set_widgets_sensitive(SCAN_CONTROLS, FALSE);
+    set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
     g_timeout_add(SCAN_DELAY_MS, cb_refresh, nullptr);
     return FALSE;
 }
@@ -87,10 +84,8 @@ gboolean cb_refresh(gpointer)
 
     send_status_to_desktop(STATUS_SCANNING);
     get_cell(iface);
-    for (const char *key : {"button-network-configure", "button-connect", "button-wifi-settings",
-                            "button-refresh", "view-press"})
-        set_widget_sensitive(key, TRUE);
-    set_widget_sensitive("button-active-device", FALSE);
+    set_widgets_sensitive(SCAN_CONTROLS, TRUE);
+    set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
     my_wifi->cell_index = -1;
     if (my_wifi->cell_count < 1) {
         set_title_label(_("No Network"));
