@@ -52,6 +52,16 @@ GtkWidget *create_normal_ComboBox()
     return combo;
 }
 
+gboolean is_active(GtkWidget *button)
+{
+    return gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(button));
+}
+
+void set_active(GtkWidget *button, gboolean active)
+{
+    gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(button), active);
+}
+
 void set_active_number(GtkWidget *combo, const char *number)
 {
     const gint64 item = g_ascii_strtoll(number, nullptr, 10);
@@ -60,6 +70,29 @@ void set_active_number(GtkWidget *combo, const char *number)
 
     gtk_combo_box_set_active(GTK_COMBO_BOX(combo),
                              item >= 0 && item < items ? static_cast<gint>(item) : 0);
+}
+
+GtkWidget *create_dialog(const gchar *title, GtkWidget *parent, dialog_default which)
+{
+    GtkWidget *dialog =
+        gtk_dialog_new_with_buttons(title, GTK_WINDOW(parent), GTK_DIALOG_DESTROY_WITH_PARENT,
+                                    GTK_STOCK_OK, GTK_RESPONSE_OK, nullptr);
+    GtkWidget *cancel =
+        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    // Without a default button the window takes the default itself.
+    GtkWidget *widget = which == DEFAULT_CANCEL ? cancel : dialog;
+
+    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_widget_set_can_default(widget, TRUE);
+    gtk_widget_grab_default(widget);
+    return dialog;
+}
+
+void pack_content(GtkWidget *dialog, GtkWidget *content)
+{
+    GtkWidget *area = gtk_dialog_get_content_area(GTK_DIALOG(dialog));
+
+    gtk_box_pack_start(GTK_BOX(area), content, TRUE, TRUE, 0);
 }
 
 GtkWidget *create_titled_frame(const gchar *title, guint border)

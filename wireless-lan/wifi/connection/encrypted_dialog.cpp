@@ -259,9 +259,8 @@ void forget_stored_key()
 
 static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
 {
-    gtk_table_attach(GTK_TABLE(table), widget, left, 2, row, row + 1,
-                     static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL), GTK_FILL, PADDING,
-                     PADDING);
+    gtk_table_attach(GTK_TABLE(table), widget, left, 2, row, row + 1, EXPAND_FILL, GTK_FILL,
+                     PADDING, PADDING);
 }
 
 // A frame over the whole width of `row`; the box in it is returned.
@@ -315,15 +314,10 @@ static void pack_key(GtkWidget *box, GtkWidget *entry, GtkWidget *index)
 
 static GtkWidget *create_dialog_window()
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(
-        _("Encrypted Network"), nullptr, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
-        GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
+    GtkWidget *dialog = create_dialog(_("Encrypted Network"), nullptr, DEFAULT_NONE);
 
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_window_set_default_size(GTK_WINDOW(dialog), 400, 320);
     gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
-    gtk_widget_set_can_default(dialog, TRUE);
-    gtk_widget_grab_default(dialog);
     gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
     return dialog;
 }

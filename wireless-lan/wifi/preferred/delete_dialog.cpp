@@ -9,11 +9,7 @@
 
 static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(_("Delete Network"), GTK_WINDOW(parent),
-                                                    GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
-                                                    GTK_RESPONSE_OK, nullptr);
-    GtkWidget *cancel =
-        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    GtkWidget *dialog = create_dialog(_("Delete Network"), parent, DEFAULT_CANCEL);
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
     GtkWidget *image = gtk_image_new_from_stock(GTK_STOCK_DIALOG_WARNING, GTK_ICON_SIZE_DIALOG);
     GtkWidget *label = gtk_label_new(nullptr);
@@ -22,10 +18,7 @@ static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
     g_autofree gchar *markup =
         g_strdup_printf("%s\n%s?", _("Do you want to detele the network"), escaped);
 
-    gtk_widget_set_can_default(cancel, TRUE);
-    gtk_widget_grab_default(cancel);
     gtk_window_set_default_size(GTK_WINDOW(dialog), 120, 120);
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_dialog_set_has_separator(GTK_DIALOG(dialog), FALSE);
     gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
 
@@ -39,8 +32,7 @@ static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_table_attach(GTK_TABLE(table), image, 0, 1, 1, 2, GTK_FILL, GTK_FILL, 5, 5);
     gtk_table_attach_defaults(GTK_TABLE(table), label, 1, 2, 1, 2);
-    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table, TRUE, TRUE,
-                       0);
+    pack_content(dialog, table);
     return dialog;
 }
 

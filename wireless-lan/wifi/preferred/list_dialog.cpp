@@ -128,32 +128,24 @@ static GtkWidget *create_edit_buttons(GtkWidget *dialog)
 
 static GtkWidget *build_list_dialog()
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(_("Preferred Network Setting"), nullptr,
-                                                    GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
-                                                    GTK_RESPONSE_OK, nullptr);
-    GtkWidget *cancel =
-        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    GtkWidget *dialog = create_dialog(_("Preferred Network Setting"), nullptr, DEFAULT_CANCEL);
     GtkWidget *frame = create_titled_frame(_("Preferred Network Setting"), 5);
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
     GtkWidget *label = gtk_label_new(
         _("Automatic connect to one of the network \nfollowing the order in the list below"));
-    const auto expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
 
-    gtk_widget_set_can_default(cancel, TRUE);
-    gtk_widget_grab_default(cancel);
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_window_set_default_size(GTK_WINDOW(dialog), 480, 320);
 
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
-    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), frame, TRUE, TRUE,
-                       0);
+    pack_content(dialog, frame);
 
     gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
     gtk_table_attach(GTK_TABLE(table), label, 0, 2, 0, 1, GTK_FILL, GTK_FILL, 5, 5);
-    gtk_table_attach(GTK_TABLE(table), create_list_frame(), 0, 2, 1, 2, expand, expand, 0, 0);
-    gtk_table_attach(GTK_TABLE(table), create_edit_buttons(dialog), 0, 2, 2, 3, expand, GTK_FILL, 5,
-                     5);
+    gtk_table_attach(GTK_TABLE(table), create_list_frame(), 0, 2, 1, 2, EXPAND_FILL, EXPAND_FILL, 0,
+                     0);
+    gtk_table_attach(GTK_TABLE(table), create_edit_buttons(dialog), 0, 2, 2, 3, EXPAND_FILL,
+                     GTK_FILL, 5, 5);
     return dialog;
 }
 

@@ -66,11 +66,10 @@ static void attach_row(GtkWidget *table, guint row, const char *text, GtkWidget 
                        GtkWidget *target)
 {
     GtkWidget *label = create_label(text, target);
-    const auto expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
 
     gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
     gtk_table_attach(GTK_TABLE(table), label, 0, 1, row, row + 1, GTK_FILL, GTK_FILL, 5, 5);
-    gtk_table_attach(GTK_TABLE(table), control, 1, 2, row, row + 1, expand, GTK_FILL, 5, 5);
+    gtk_table_attach(GTK_TABLE(table), control, 1, 2, row, row + 1, EXPAND_FILL, GTK_FILL, 5, 5);
 }
 
 static GtkWidget *create_entry(const char *key)
@@ -145,21 +144,15 @@ static GtkWidget *create_key_row(const network_form &form)
 
 GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent)
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(
-        _(form.title), GTK_WINDOW(parent), GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
-        GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
+    GtkWidget *dialog = create_dialog(_(form.title), parent, DEFAULT_NONE);
     GtkWidget *frame = create_titled_frame(_("WiFi Network"), 10);
     GtkWidget *table = gtk_table_new(8, 2, FALSE);
 
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
-    gtk_widget_set_can_default(dialog, TRUE);
-    gtk_widget_grab_default(dialog);
 
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
-    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), frame, TRUE, TRUE,
-                       0);
+    pack_content(dialog, frame);
 
     GtkWidget *alias = create_entry(form.alias);
     GtkWidget *essid = create_entry(form.essid);
@@ -201,12 +194,12 @@ void choose_form_radio(const char *key)
     GtkWidget *radio = find_widget(key);
 
     if (radio != nullptr)
-        gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(radio), TRUE);
+        set_active(radio, TRUE);
 }
 
 static gboolean radio_chosen(const char *key)
 {
-    return gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(find_widget(key)));
+    return is_active(find_widget(key));
 }
 
 const gchar *form_text(const char *key)

@@ -69,16 +69,6 @@ static GSList *radio_group(GtkWidget *radio)
     return gtk_radio_button_get_group(GTK_RADIO_BUTTON(radio));
 }
 
-static gboolean is_active(GtkWidget *button)
-{
-    return gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(button));
-}
-
-static void set_active(GtkWidget *button, gboolean active)
-{
-    gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(button), active);
-}
-
 static GtkWidget *unplaced(GtkWidget *widget)
 {
     return static_cast<GtkWidget *>(g_object_ref_sink(widget));
@@ -111,8 +101,6 @@ static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
     GtkWidget *frame = create_titled_frame(_("Ad-Hoc Information"), 10);
     GtkWidget *table = gtk_table_new(8, 2, FALSE);
     GtkWidget *label = gtk_label_new(_("ESSID"));
-    const GtkAttachOptions fill = GTK_FILL;
-    const GtkAttachOptions expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
 
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
@@ -120,24 +108,18 @@ static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
     form->essid = new_entry(group_info->essid);
     gtk_misc_set_alignment(GTK_MISC(label), 1.0, 0.5);
     gtk_label_set_mnemonic_widget(GTK_LABEL(label), form->essid);
-    gtk_table_attach(GTK_TABLE(table), label, 0, 1, 0, 1, expand, expand, 5, 5);
-    gtk_table_attach(GTK_TABLE(table), form->essid, 1, 2, 0, 1, fill, fill, 5, 5);
+    gtk_table_attach(GTK_TABLE(table), label, 0, 1, 0, 1, EXPAND_FILL, EXPAND_FILL, 5, 5);
+    gtk_table_attach(GTK_TABLE(table), form->essid, 1, 2, 0, 1, GTK_FILL, GTK_FILL, 5, 5);
     return frame;
 }
 
 static GtkWidget *new_group_dialog()
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(
-        _("Ad-Hoc Information"), nullptr, GTK_DIALOG_DESTROY_WITH_PARENT, GTK_STOCK_OK,
-        GTK_RESPONSE_OK, GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT, nullptr);
+    GtkWidget *dialog = create_dialog(_("Ad-Hoc Information"), nullptr, DEFAULT_NONE);
 
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
     gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
     // Without a parent only this keeps it above the settings dialog, which is blocked meanwhile.
     gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
-    // The window takes the default itself, so that Enter neither accepts nor cancels.
-    gtk_widget_set_can_default(dialog, TRUE);
-    gtk_widget_grab_default(dialog);
     return dialog;
 }
 
@@ -168,11 +150,10 @@ void cb_adhoc_setup(GtkWidget *, gpointer user_data)
 {
     WIFI_CELL *group_info = static_cast<WIFI_CELL *>(user_data);
     GtkWidget *dialog = begin_dialog(new_group_dialog());
-    GtkWidget *content = gtk_dialog_get_content_area(GTK_DIALOG(dialog));
     group_form form;
 
     build_unplaced(&form, group_info);
-    gtk_box_pack_start(GTK_BOX(content), build_essid_row(&form, group_info), TRUE, TRUE, 0);
+    pack_content(dialog, build_essid_row(&form, group_info));
     gtk_widget_show_all(dialog);
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK &&
            !store_group(dialog, &form, group_info)) {

@@ -81,7 +81,7 @@ static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gb
     GtkWidget *check = find_settings_widget(prefix, iface->name);
 
     if (check != nullptr)
-        *state = gtk_toggle_button_get_active(GTK_TOGGLE_BUTTON(check));
+        *state = is_active(check);
 }
 
 static void enter_host_mode(const WIFI_INTERFACE *iface)

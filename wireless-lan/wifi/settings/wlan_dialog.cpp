@@ -30,11 +30,6 @@ static const struct {
 };
 static_assert(G_N_ELEMENTS(ADDRESS_TEXTS) == G_N_ELEMENTS(address_settings));
 
-static void set_active(GtkWidget *button, gboolean active)
-{
-    gtk_toggle_button_set_active(GTK_TOGGLE_BUTTON(button), active);
-}
-
 static void set_setting_sensitive(const char *prefix, const gchar *iface_name, gboolean sensitive)
 {
     g_autofree gchar *key = settings_key(prefix, iface_name);
@@ -119,7 +114,6 @@ static void create_propt_editable_entry(const WIFI_INTERFACE *iface, GtkWidget *
 {
     const address_setting &setting = address_settings[index];
     const guint padding = static_cast<guint>(boxspacing);
-    const GtkAttachOptions expand = static_cast<GtkAttachOptions>(GTK_EXPAND | GTK_FILL);
     GtkWidget *label = gtk_label_new(_(ADDRESS_TEXTS[index].label));
     GtkWidget *entry = gtk_entry_new();
     g_autofree gchar *key = settings_key(setting.prefix, iface->name);
@@ -138,8 +132,8 @@ static void create_propt_editable_entry(const WIFI_INTERFACE *iface, GtkWidget *
         gtk_tooltips_set_tip(tooltips, widget, _(ADDRESS_TEXTS[index].tooltip), nullptr);
     gtk_table_attach(GTK_TABLE(attach_to), label, 0, 1, clnr, clnr + 1, GTK_FILL, GTK_FILL, padding,
                      hspacing);
-    gtk_table_attach(GTK_TABLE(attach_to), entry, 1, 2, clnr, clnr + 1, expand, expand, padding,
-                     hspacing);
+    gtk_table_attach(GTK_TABLE(attach_to), entry, 1, 2, clnr, clnr + 1, EXPAND_FILL, EXPAND_FILL,
+                     padding, hspacing);
 }
 
 static GtkWidget *create_auto_dns(const WIFI_INTERFACE *iface)
@@ -189,21 +183,13 @@ static GtkWidget *create_network_widgets(WIFI_INTERFACE *iface)
 
 static GtkWidget *create_settings_dialog(WIFI_INTERFACE *iface)
 {
-    GtkWidget *dialog = gtk_dialog_new_with_buttons(
-        _("WLAN Setting"), GTK_WINDOW(mainwindow),
-        static_cast<GtkDialogFlags>(GTK_DIALOG_MODAL | GTK_DIALOG_DESTROY_WITH_PARENT),
-        GTK_STOCK_OK, GTK_RESPONSE_OK, nullptr);
-    GtkWidget *cancel =
-        gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
+    GtkWidget *dialog = create_dialog(_("WLAN Setting"), mainwindow, DEFAULT_CANCEL);
     GtkWidget *content = create_network_widgets(iface);
 
-    gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);
+    gtk_window_set_modal(GTK_WINDOW(dialog), TRUE);
     gtk_window_set_default_size(GTK_WINDOW(dialog), 360, 320);
-    gtk_widget_set_can_default(cancel, TRUE);
-    gtk_widget_grab_default(cancel);
     gtk_container_set_border_width(GTK_CONTAINER(content), 5);
-    gtk_box_pack_start(GTK_BOX(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), content, TRUE,
-                       TRUE, 0);
+    pack_content(dialog, content);
     gtk_widget_show_all(dialog);
     return dialog;
 }
