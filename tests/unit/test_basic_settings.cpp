@@ -2,6 +2,8 @@
 
 #include <sys/stat.h>
 
+#include <algorithm>
+
 #include "support/commands.h"
 #include "support/model.h"
 #include "support/random_text.h"

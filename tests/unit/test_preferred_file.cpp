@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+
 #include "support/commands.h"
 #include "support/model.h"
 #include "support/random_text.h"
