@@ -63,6 +63,14 @@ def test_arguments_arrive_byte_for_byte(device):
     assert command.status == 0
 
 
+def test_a_line_of_the_log_counts_once_it_is_whole(device):
+    d = device("street")
+    d.sh("/sbin/iwset one")
+    with open(f"{d.state}/log", "ab") as log:
+        log.write(b'{"event": "start", "pid": 1, "pp')
+    assert [command.argv for command in d.commands()] == [["/sbin/iwset", "one"]]
+
+
 REQUESTS = """
 import fcntl, socket, struct
 def ask(request, name):

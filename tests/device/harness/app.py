@@ -4,6 +4,7 @@
 import os
 import re
 import signal
+import time
 
 from probe import LIMIT, Program, wait_until
 
@@ -60,10 +61,20 @@ class App(Program):
             return int(re.search(r"^Private_Dirty: *(\d+)", sums.read(), re.M)[1])
 
     def kill(self):
-        if self.running():
-            os.kill(self.pid, signal.SIGKILL)
+        while self.running():  # which it may not be any more a moment later
+            for child in child_ids(self.process.pid)[:1]:
+                kill(child)
+            time.sleep(0.005)
         self.disconnect()
         return self.wait_end()
+
+
+def kill(pid):
+    """Kills a process that may have ended by itself."""
+    try:
+        os.kill(pid, signal.SIGKILL)
+    except ProcessLookupError:
+        pass
 
 
 def child_ids(pid):

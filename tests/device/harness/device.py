@@ -11,7 +11,7 @@ from dataclasses import dataclass
 from probe import LIMIT, wait_until
 from support.grammar import scan_text, to_bytes
 
-from .app import App, child_ids
+from .app import App, child_ids, kill
 from .clock import Clock
 from .display import Display
 
@@ -97,7 +97,7 @@ class Device:
     def close(self):
         if self._simulate is not None and self._simulate.poll() is None:
             for child in child_ids(self._simulate.pid):
-                os.kill(child, 9)
+                kill(child)
             self._simulate.wait()
         for app in self.apps:
             app.disconnect()
@@ -276,7 +276,8 @@ class Device:
     def commands(self, *names):
         """All commands so far in the order in which they began, or those with these names."""
         found, by_pid = [], {}
-        for line in self.state_file("log").splitlines():
+        # A line that is being written is not there yet.
+        for line in self.state_file("log").split(b"\n")[:-1]:
             entry = json.loads(line)
             if entry["event"] == "start":
                 texts = [one.encode("latin-1").decode("utf-8", "surrogateescape")
@@ -319,7 +320,7 @@ class Device:
     def keep(self, folder):
         """Saves what a failed test needs to be understood."""
         os.makedirs(folder, exist_ok=True)
-        if self.display is not None:
+        if self.display is not None and self.display.alive():
             self.display.screenshot(f"{folder}/screen.png")
         for name in os.listdir(self.state):
             if re.match(r"(stdout|stderr|log|scan|wireless|ap|simulate|display)", name):

@@ -4,7 +4,10 @@
 import os
 import subprocess
 
+from Xlib import X
+
 from probe import Screen
+from support.png import save_png
 
 
 class Display(Screen):
@@ -33,9 +36,13 @@ class Display(Screen):
             stdout=self._log, stderr=self._log, **more))
 
     def screenshot(self, path):
-        subprocess.run(["import", "-display", self.name, "-window", "root", path],
-                       check=False, stdout=self._log, stderr=self._log)
-        return path
+        """Saves what the screen shows as a PNG file; gives the path."""
+        size = self.root.get_geometry()
+        image = self.root.get_image(0, 0, size.width, size.height, X.ZPixmap, 0xFFFFFFFF)
+        return save_png(path, size.width, size.height, image.data)
+
+    def alive(self):
+        return all(process.poll() is None for process in self._processes)
 
     def close(self):
         for process in reversed(self._processes):
