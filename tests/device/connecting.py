@@ -1,6 +1,7 @@
 """Steps of a connect that several tests take. Time stands still but for what a test lets pass."""
 
 from harness import wait_until
+from preferred import FILE, Network, file_of
 from support.grammar import scan_text
 
 IDLE = "Wireless network selection"
@@ -23,7 +24,7 @@ def connected(ip):
 
 
 def idle(device, *networks, **settings):
-    """A device with these networks in the list, nothing under way, and its commands without hooks."""
+    """A device with these networks in the list, nothing under way, and commands that do nothing."""
     start = {name: settings.pop(name) for name in ("environment", "device_path")
              if name in settings}
     d = device("none", rate=50, scan=scan_text(*networks), **settings)
@@ -79,7 +80,9 @@ def answer_key(app, key, authentication=None, index=None, offer="gtk-no"):
 
 def type_answer(app, question, text):
     """Types into a question's entry, which has the focus from the start."""
-    entry = lambda: question.find(type="GtkEntry")
+    def entry():
+        return question.find(type="GtkEntry")
+
     assert entry()["text"] == ""
     wait_until(lambda: entry()["focus"], "the focus on the question's entry")
     app.display.type(text)
@@ -125,15 +128,10 @@ def refresh(d, app):
 
 
 def preferred(*networks):
-    """The file of preferred networks: (alias, essid, authentication, index, key) each."""
-    text = b""
-    for number, (alias, essid, authentication, index, key) in enumerate(networks):
-        values = [value.encode("utf-8", "surrogateescape") if isinstance(value, str) else value
-                  for value in (alias, essid, key)]
-        text += (b"USERCELL %d\nALIAS %s\nESSID %s\nMODE Managed\nKMGMT %d\nKINDEX %d\n"
-                 b"Encryption open\nKEY %s\n") % (number, values[0], values[1], authentication,
-                                                  index, values[2])
-    return {"/etc/wireless-user.conf": text}
+    """The file of preferred networks with keys: (alias, essid, authentication, index, key) each."""
+    return {FILE: file_of(*(
+        Network(essid, alias, wpa=authentication, index=index, enc="open", key=key)
+        for alias, essid, authentication, index, key in networks))}
 
 
 def children(pid):

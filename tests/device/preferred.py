@@ -1,9 +1,10 @@
-"""Preferred networks in the tests: the layout of their file, written here a second time, and the
-way to their dialogs."""
+"""Preferred networks in the tests: the layout of their file, written without the program, and
+the way to their dialogs."""
 
 from typing import NamedTuple
 
 from harness import wait_until
+from support.grammar import to_bytes
 
 FILE = "/etc/wireless-user.conf"
 FRONT = "user_cell_list_front"
@@ -35,12 +36,16 @@ class Network(NamedTuple):
 
 
 def file_of(*networks):
-    lines = []
+    """The file of these networks (bytes)."""
+    text = b""
     for number, one in enumerate(networks):
-        lines += [f"USERCELL {number}", f"ALIAS {one.alias}", f"ESSID {one.essid}",
-                  f"MODE {one.mode}", f"KMGMT {one.wpa}", f"KINDEX {one.index}",
-                  f"Encryption {one.enc}", f"KEY {'off' if one.enc == 'off' else one.key}"]
-    return "".join(line + "\n" for line in lines).encode("utf-8", "surrogateescape")
+        values = {"USERCELL": number, "ALIAS": one.alias, "ESSID": one.essid, "MODE": one.mode,
+                  "KMGMT": one.wpa, "KINDEX": one.index, "Encryption": one.enc,
+                  "KEY": "off" if one.enc == "off" else one.key}
+        for name, value in values.items():
+            value = str(value) if isinstance(value, int) else value
+            text += to_bytes(name) + b" " + to_bytes(value) + b"\n"
+    return text
 
 
 def start(device, *networks, scenario="street"):

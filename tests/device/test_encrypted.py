@@ -7,8 +7,8 @@ import pytest
 from connecting import (OFFER, answer_key, arrive, connect, idle, preferred, type_answer,
                         wait_commands)
 from harness import wait_until
+from preferred import FILE, Network, file_of
 
-FILE = "/etc/wireless-user.conf"
 TEXT = "Encrypted Network,Please enter the key."
 HOME = ("home net", "on")
 
@@ -130,7 +130,8 @@ def test_two_stored_networks_of_one_name(device):
     d.display.type("typed")
     wait_until(lambda: answers(dialog)[:2] == ("typed", True), "the typed key in clear")
     dialog.choose("GtkComboBox", 1)
-    wait_until(lambda: answers(dialog) == ("second-key", False, 1, 2), lambda: dialog.tree().sketch())
+    wait_until(lambda: answers(dialog) == ("second-key", False, 1, 2),
+               lambda: dialog.tree().sketch())
     cancel(dialog)
 
     # What was shown has gone into the records: the next look at the lists has it.
@@ -177,7 +178,8 @@ def test_what_is_offered(device, key, authentication, index, offered):
     assert app.dialogs() == []
     argv = d.commands("iwset")[0].argv
     assert argv[argv.index("key") + 1] == ("first-key" if key is None else key or "off")
-    assert argv[-1] == ("open" if authentication == 1 else f"[{(1 if index is None else index) + 1}]")
+    assert argv[-1] == (
+        "open" if authentication == 1 else f"[{(1 if index is None else index) + 1}]")
     assert d.file(FILE) == before[FILE]
     assert app.stdout().count("key_mgmt=") == app.stdout().count("do connect key_index=") == 1
 
@@ -196,9 +198,8 @@ def test_keeping_networks(device):
     type_answer(app, question, "At home")
     question.press("gtk-yes")
     wait_commands(d, app)
-    first = (b"USERCELL 0\nALIAS At home\nESSID home net\nMODE Managed\nKMGMT 1\nKINDEX 0\n"
-             b"Encryption open\nKEY secret one\n")
-    assert d.file(FILE) == first
+    first = Network("home net", "At home", wpa=1, enc="open", key="secret one")
+    assert d.file(FILE) == file_of(first)
     assert app.registered_rows("user_cell_list_backend") == [
         ["At home", "home net", "Managed", "ENC_OPEN", "secret one", "1", "0"]]
     assert app.registered_rows("user_cell_list_front") == [["At home"]]
@@ -208,9 +209,8 @@ def test_keeping_networks(device):
     connect(app, 1)
     offer(app, "12345", index=2).press("gtk-yes")
     wait_commands(d, app, 2)
-    second = (b"USERCELL 1\nALIAS \nESSID friend\nMODE Ad-Hoc\nKMGMT 0\nKINDEX 2\n"
-              b"Encryption open\nKEY 12345\n")
-    assert d.file(FILE) == first + second
+    second = Network("friend", mode="Ad-Hoc", index=2, enc="open", key="12345")
+    assert d.file(FILE) == file_of(first, second)
     assert app.registered_rows("user_cell_list_backend")[1] == [
         "", "friend", "Ad-Hoc", "ENC_OPEN", "12345", "0", "2"]
     assert app.registered_rows("user_cell_list_front") == [["At home"], ["friend"]]

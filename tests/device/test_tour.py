@@ -1,12 +1,12 @@
 """One walk through the whole program, as its owner takes it on the first evening."""
 
 from connecting import IDLE, OFFER, connected, preferred
+from preferred import FILE
 from settings_page import ADDRESSES, CONF, PREFIXES, Settings, dhcp, static
 
-USER_CONF = "/etc/wireless-user.conf"
 ROW = 2  # "Haus 14"
 RATE = 10
-HOME = preferred(("at home", "Haus 14", 1, 0, "correct-horse"))[USER_CONF]
+HOME = preferred(("at home", "Haus 14", 1, 0, "correct-horse"))[FILE]
 LEASE, FIXED = "192.168.7.23", ADDRESSES[0]
 WPA = ["/sbin/iwset", "wpa", "wlan0", "essid", "Haus 14", "mode", "Managed", "key",
        "correct-horse", "enc", "open"]
@@ -72,7 +72,7 @@ def test_tour(device):
     assert told() == [["/sbin/ifconfig", "wlan0", "up"], WPA, IF_UP]
     assert d.file("/tmp/essid_tmp") == b"Haus 14\n"
     assert d.file("/tmp/key_tmp") == b"correct-horse\n"
-    assert d.file(USER_CONF) == HOME
+    assert d.file(FILE) == HOME
     assert app.label("button-connect") == "gtk-disconnect"
 
     # A fixed address.
@@ -133,7 +133,7 @@ def test_tour(device):
     app = d.start()
     assert app.wait_listed() == networks
     assert d.file(CONF).decode() == dhcp(essid="the")
-    assert d.file(USER_CONF) == HOME
+    assert d.file(FILE) == HOME
     settings = Settings(app)
     assert settings.active("dhcp", "static", "auto_dns", "adhoc-host") == [True, False, True, False]
     settings.cancel()
@@ -145,5 +145,5 @@ def test_tour(device):
     key.press("gtk-ok")  # known already: not offered again
     app.wait_state(ROW, connected(LEASE))
     assert WPA in told()
-    assert d.file(USER_CONF) == HOME
+    assert d.file(FILE) == HOME
     assert app.quit() == 0
