@@ -2,7 +2,8 @@
 
     measure.py BUILD [STARTS [REFRESHES [ONLY...]]]
 
-BUILD is the build folder, ONLY names the measurements of MEASUREMENTS to take. What each line of the table means stands in README.md.
+BUILD is the build directory, ONLY names the measurements of MEASUREMENTS to take. README.md says
+what each line of the table means.
 """
 
 import os
@@ -28,7 +29,7 @@ COUNTER_SLOWNESS = 50
 
 TOOLS = BUILD / "bench"
 PROGRAM = BUILD / "wireless-lan" / "wireless-lan"
-# Nothing more is drawn after so many milliseconds without drawing; the pause before the scan is 100.
+# Nothing more is drawn after so many milliseconds without drawing; before the scan they are 100.
 QUIET = 400
 
 rows = []
@@ -56,7 +57,8 @@ def put(name, text):
 
 
 def set_interfaces(count):
-    put("wireless", "Inter-| sta-|   Quality        |   Discarded packets               | Missed | WE\n"
+    put("wireless",
+        "Inter-| sta-|   Quality        |   Discarded packets               | Missed | WE\n"
         " face | tus | link level noise |  nwid  crypt   frag  retry   misc | beacon | 22\n"
         + " wlan0: 0000    0     0     0        0      0      0      0      0        0\n" * count)
 
@@ -66,11 +68,14 @@ def set_networks(count):
     for number in range(1, count + 1):
         channel = number % 11 + 1
         text.append(
-            f"          Cell {number:02d} - Address: 02:00:00:00:{number // 256:02X}:{number % 256:02X}\n"
+            f"          Cell {number:02d} - Address: "
+            f"02:00:00:00:{number // 256:02X}:{number % 256:02X}\n"
             f"                    ESSID:\"network {number:03d}\"\n"
             "                    Mode:Master\n"
-            f"                    Frequency:{(2407 + 5 * channel) / 1000:.3f} GHz (Channel {channel})\n"
-            f"                    Quality:{number % 100}/100  Signal level:-60 dBm  Noise level:-95 dBm\n"
+            f"                    Frequency:{(2407 + 5 * channel) / 1000:.3f} GHz "
+            f"(Channel {channel})\n"
+            f"                    Quality:{number % 100}/100  Signal level:-60 dBm  "
+            "Noise level:-95 dBm\n"
             f"                    Encryption key:{'on' if number % 3 == 0 else 'off'}\n"
             "                    Bit Rates:54 Mb/s\n")
     put("scan", "".join(text))
@@ -243,7 +248,7 @@ def starts(size):
 
 
 def report_starts(cases):
-    empty, widgets, bare, refresh, program = cases.values()
+    _, widgets, bare, refresh, program = cases.values()
     for name, case in cases.items():
         report(f"first whole picture: {name}", spread(case.picture_ms))
     for name in ("refresh", "program"):
@@ -294,7 +299,8 @@ def instructions(size):
             start.close()
             counts[name].append(int(re.search(r"^totals: (\d+)", out.read_text(), re.M)[1]))
     for name, values in counts.items():
-        report(f"instructions, start to filled list and end: {name}", f"{median(values) / 1e6:.1f} M")
+        report(f"instructions, start to filled list and end: {name}",
+               f"{median(values) / 1e6:.1f} M")
     ratio("instructions / refresh", counts["program"], counts["refresh"], 1.03)
 
 

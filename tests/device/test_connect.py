@@ -20,8 +20,9 @@ def files(d):
 
 
 def test_every_kind_of_network(device):
-    d, app = idle(device, "open", ("wep", "on"), ("WPA net", "on"), ("friend", "off", "7", "Ad-Hoc"),
-                  ("shout", "off", "7", "MASTER"), ("odd", "wep", "7", "Managed"), ("bare", "on"))
+    d, app = idle(device, "open", ("wep", "on"), ("WPA net", "on"),
+                  ("friend", "off", "7", "Ad-Hoc"), ("shout", "off", "7", "MASTER"),
+                  ("odd", "wep", "7", "Managed"), ("bare", "on"))
     count = 0
 
     def join(row, argv, printed, essid_file, key_file, **answers):
@@ -252,8 +253,8 @@ def test_hidden_names(device):
     app.key("Return")
     answer_key(app, "12345")
     wait_commands(d, app, 2)
-    assert told(d)[1:] == ["wlan0", "essid", "Büro", "mode", "Managed", "key", "12345", "enc", "open",
-                           "[1]"]
+    assert told(d)[1:] == ["wlan0", "essid", "Büro", "mode", "Managed", "key", "12345",
+                           "enc", "open", "[1]"]
     arrive(d, app, 1)
 
     # No: the name stays empty and the connect goes on.
@@ -269,9 +270,9 @@ def test_hidden_names(device):
 
 # Each as the name and as the stored key of a network. A stored key has no blanks.
 FIGHTERS = [
-    b'";touch${IFS}/tmp/x;"', b"$HOME", b"`id`", b"\\", b"\\t\\n\\c", b"$(touch${IFS}/tmp/x)", b"-n",
-    b"-e", b"--help", b"%s%n%d", b"'", b"!$#&|<>*?[]{}~;()", b"caf\xe9\xff\xfe", "☕".encode() * 42,
-    b'"' * 63, PRINTABLE[:63].encode(), PRINTABLE[63:].encode(),
+    b'";touch${IFS}/tmp/x;"', b"$HOME", b"`id`", b"\\", b"\\t\\n\\c", b"$(touch${IFS}/tmp/x)",
+    b"-n", b"-e", b"--help", b"%s%n%d", b"'", b"!$#&|<>*?[]{}~;()", b"caf\xe9\xff\xfe",
+    "☕".encode() * 42, b'"' * 63, PRINTABLE[:63].encode(), PRINTABLE[63:].encode(),
 ]
 
 

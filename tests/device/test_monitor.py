@@ -214,8 +214,9 @@ def test_hosting_needs_no_address(device):
 
 def catalogue(folder):
     """Every text of the program with a mark before it, as a message catalogue."""
-    texts = ["Wireless network selection", "Connect network...", "Connected\\nAcquire IP address...",
-             "Connected\\nIP Address", "Connected\\nIP address invalid", "Not Connect", "Disconnect"]
+    texts = ["Wireless network selection", "Connect network...",
+             "Connected\\nAcquire IP address...", "Connected\\nIP Address",
+             "Connected\\nIP address invalid", "Not Connect", "Disconnect"]
     source = 'msgid ""\nmsgstr "Content-Type: text/plain; charset=UTF-8\\n"\n\n'
     source += "".join(f'msgid "{text}"\nmsgstr "· {text}"\n\n' for text in texts)
     done = subprocess.run(["msgfmt", "-o", "-", "-"], input=source.encode(), cwd=folder, check=True,

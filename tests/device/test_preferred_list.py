@@ -51,7 +51,8 @@ def test_widgets(device):
         assert dialog.props(inner)["packing"][option] == EXPAND | FILL
 
     table, inner_table = tree.all(type="GtkTable")
-    assert [props(dialog, table)[name] for name in ("n-rows", "n-columns", "border-width")] == [4, 2, 5]
+    assert [props(dialog, table)[name] for name in
+            ("n-rows", "n-columns", "border-width")] == [4, 2, 5]
     assert [props(dialog, inner_table)[name] for name in ("n-rows", "n-columns")] == [2, 2]
     text = tree.find(text="Automatic connect to one of the network \n"
                           "following the order in the list below")
@@ -204,7 +205,7 @@ def test_delete(device):
         assert len(app.registered_rows(BACKEND)) == len(wanted)
         assert dialog.selected(FRONT) == selected
 
-    # A middle row: the next one takes its place. The last: the one before. The first: the new first.
+    # A middle row: the next one takes its place. The last: the one before. The first: the new one.
     delete(["Home", "cafe", "Office"], [2])
     assert app.stderr().count("select row [2],column [0]\n") == 2
     delete(["Home", "cafe"], [1])

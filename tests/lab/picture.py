@@ -8,7 +8,8 @@ path = sys.argv[1]
 with open(path, "rb") as file:
     dump = file.read()
 # The header is big-endian: its size, version, format, depth, width, height ...
-(size, _, _, _, width, height, _, order, _, _, _, bits, line, *_) = struct.unpack(">25I", dump[:100])
+header = struct.unpack(">25I", dump[:100])
+(size, _, _, _, width, height, _, order, _, _, _, bits, line, *_) = header
 colours = struct.unpack(">I", dump[76:80])[0]
 if bits != 32:
     sys.exit(f"{path}: {bits} bits a pixel")

@@ -134,8 +134,8 @@ def awk_directory(name):
 
 
 def choose(*names):
-    """Which of the stubs are installed; the log begins anew. What an earlier command has left in the
-    background goes on in the log that it was started with."""
+    """Which of the stubs are installed; the log begins anew. What an earlier command has left in
+    the background goes on in the log that it was started with."""
     global LOG
     shutil.rmtree(CHOSEN, ignore_errors=True)
     os.makedirs(CHOSEN)

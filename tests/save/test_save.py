@@ -1,5 +1,6 @@
 # SPDX-License-Identifier: MIT
-"""Saves under bad luck: a kill or an error at every system call, full disks, foreign owners, mounts.
+"""Saves under bad luck: a kill or an error at every system call, full disks, foreign owners,
+mounts.
 
 Runs tests/save-program of the build directory WIRELESS_LAN_BUILD. What needs mounts runs in a mount
 namespace of its own."""

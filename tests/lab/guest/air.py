@@ -2,8 +2,9 @@
 """The other side of the air: simulated radios, access points, addresses, a second station.
 
 Radio 0 is the device's own and stays where the program is. All others live in network namespaces
-of their own, so that nothing reaches them but what is sent through the air. Every access point has
-a network of its own, 10.9.N.0/24 with the access point as 10.9.N.1: an address tells who gave it."""
+of their own, so that nothing reaches them but what is sent through the air. Every access point
+has a network of its own, 10.9.N.0/24 with the access point as 10.9.N.1: an address tells who gave
+it."""
 
 import subprocess
 

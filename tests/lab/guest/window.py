@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: MIT
-"""The program's window as a person in the lab has it: the eyes and hands of tests/probe, and what is
-waited for where the networks are real."""
+"""The program's window as a person in the lab has it: the eyes and hands of tests/probe, and what
+is waited for where the networks are real."""
 
 import os
 import time

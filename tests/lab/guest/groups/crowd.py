@@ -32,7 +32,7 @@ def of_163_networks_128_are_listed():
     same(len(set(listed)), 128, "the number of different rows")
     check(all(re.fullmatch(r"Network \d{3}", one) for one in listed), f"the rows are {listed}")
     # All of them can be scrolled to: the list measures its rows little by little.
-    wait_until(lambda: w.app.find(w.LIST)["rect"][3] > 128 * 12, "the list to be as high as its rows")
+    wait_until(lambda: w.app.find(w.LIST)["rect"][3] > 128 * 12, "a list as high as its rows")
     w.photograph("crowd")
 
 
