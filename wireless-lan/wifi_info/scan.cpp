@@ -158,6 +158,7 @@ void read_cells(FILE *stream)
 {
     release_cells();
 
+    const char *disconnected = gettext("Disconnect");
     char line[LINE_SIZE] = "";
 
     while (fgets(line, sizeof line, stream)) {
@@ -167,7 +168,7 @@ void read_cells(FILE *stream)
 
         WIFI_CELL *cell = g_new0(WIFI_CELL, 1);
 
-        copy_field(cell->state, sizeof cell->state, gettext("Disconnect"));
+        copy_field(cell->state, sizeof cell->state, disconnected);
         cell->linkstate = 2;
         read_cell(stream, line, cell);
         if (my_wifi->cell_count == MAX_CELLS) {

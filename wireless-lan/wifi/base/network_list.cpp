@@ -44,11 +44,14 @@ void review_tree_vanpro(const gchar *data)
     if (store == nullptr)
         return;
     gtk_list_store_clear(store);
+
+    const gchar *disconnected = _("Disconnect");
+
     for (int i = 0; i < my_wifi->cell_count; i++) {
         WIFI_CELL *cell = my_wifi->wifi_cell[i];
         const gboolean connected = i == connect_index;
 
-        copy_field(cell->state, sizeof cell->state, connected ? data : _("Disconnect"));
+        copy_field(cell->state, sizeof cell->state, connected ? data : disconnected);
         cell->linkstate = connected ? 1 : 2;
         model_data_new(store, cell->essid, cell->mode, cell->key, cell->quality, cell->state);
     }

@@ -7,6 +7,7 @@
 
 #include "base/desktop.h"
 #include "base/dialogs.h"
+#include "base/icons.h"
 #include "base/state.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/device.h"
@@ -21,6 +22,13 @@ static void cb_leave(GtkWidget *, gpointer)
 {
     mainwindow = nullptr;
     gtk_main_quit();
+}
+
+// A closed window just goes with the process: to destroy all its rows first would only take time.
+static gboolean cb_close(GtkWidget *, GdkEvent *, gpointer)
+{
+    gtk_main_quit();
+    return TRUE;
 }
 
 static guint unseen_timer = 0; // 0: it has fired or is not needed any more
@@ -76,6 +84,7 @@ int main(int argc, char **argv)
     textdomain(TEXT_DOMAIN);
     bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
     gtk_init(&argc, &argv);
+    use_built_in_icons();
     if (!my_wifi_init()) {
         debug_line("my_wifi_init error!!!\r");
         return EXIT_SUCCESS;
@@ -84,6 +93,7 @@ int main(int argc, char **argv)
     mainwindow = gtk_window_new(GTK_WINDOW_TOPLEVEL);
     gtk_window_set_title(GTK_WINDOW(mainwindow), _("Wireless LAN"));
     g_signal_connect(mainwindow, "destroy", G_CALLBACK(cb_leave), nullptr);
+    g_signal_connect(mainwindow, "delete-event", G_CALLBACK(cb_close), nullptr);
     gtk_container_set_border_width(GTK_CONTAINER(mainwindow), 10);
 
     GtkWidget *pane = gtk_hpaned_new();

@@ -1,0 +1,13 @@
+// SPDX-License-Identifier: MIT
+// Where the toolkit looks its icons up.
+
+#ifndef WIFI_BASE_ICONS_H
+#define WIFI_BASE_ICONS_H
+
+// Keeps the icon theme of the default screen from searching its directories while nobody has chosen
+// a theme: every stock icon is then the toolkit's built-in one, which the search would end with.
+// Once a theme is named, by a settings manager or a gtkrc, the theme searches as usual. Call it
+// after gtk_init and before the first icon.
+void use_built_in_icons();
+
+#endif
