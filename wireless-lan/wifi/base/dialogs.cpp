@@ -2,6 +2,8 @@
 
 #include <initializer_list>
 
+#include "wifi_info/text.h"
+
 static void run_message(GtkWidget *parent, GtkDialogFlags flags, GtkButtonsType buttons,
                         const gchar *message, const gchar *explanation)
 {
@@ -64,12 +66,11 @@ void set_active(GtkWidget *button, gboolean active)
 
 void set_active_number(GtkWidget *combo, const char *number)
 {
-    const gint64 item = g_ascii_strtoll(number, nullptr, 10);
+    const int item = decimal(number);
     const int items =
         gtk_tree_model_iter_n_children(gtk_combo_box_get_model(GTK_COMBO_BOX(combo)), nullptr);
 
-    gtk_combo_box_set_active(GTK_COMBO_BOX(combo),
-                             item >= 0 && item < items ? static_cast<gint>(item) : 0);
+    gtk_combo_box_set_active(GTK_COMBO_BOX(combo), item >= 0 && item < items ? item : 0);
 }
 
 GtkWidget *create_dialog(const gchar *title, GtkWidget *parent, dialog_default which)

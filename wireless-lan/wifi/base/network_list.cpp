@@ -29,6 +29,11 @@ static GtkListStore *cell_list()
     return static_cast<GtkListStore *>(g_object_get_data(G_OBJECT(mainwindow), NETWORK_ROWS));
 }
 
+gchar *connected_state(const char *address)
+{
+    return g_strdup_printf("%s:%s", _("Connected\nIP Address"), address);
+}
+
 void clear_network_list()
 {
     GtkListStore *store = cell_list();

@@ -9,6 +9,9 @@
 void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, const gchar *Key,
                     const gchar *Quality, const gchar *State);
 
+// The state of the connected network while the interface has `address`. g_free it.
+gchar *connected_state(const char *address);
+
 // Removes all rows.
 void clear_network_list();
 

@@ -142,7 +142,7 @@ static void print_statics(char *values)
         field = strtok_r(nullptr, " \n", &rest);
         if (field == nullptr)
             return;
-        debug_line("%s%d", label, static_cast<int>(strtol(field, nullptr, 10)));
+        debug_line("%s%d", label, decimal(field));
     }
 }
 

@@ -31,7 +31,7 @@ static void show_address()
 
     get_interface_statistics_data(iface);
 
-    g_autofree gchar *status = g_strdup_printf("%s:%s", _("Connected\nIP Address"), iface->address);
+    g_autofree gchar *status = connected_state(iface->address);
 
     review_tree_vanpro(status);
 }

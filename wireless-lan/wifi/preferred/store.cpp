@@ -21,7 +21,7 @@ static GtkWidget *backend_list = nullptr;
 
 static guint32 number_value(const char *text)
 {
-    return static_cast<guint32>(g_ascii_strtoll(text, nullptr, 10));
+    return static_cast<guint32>(decimal(text));
 }
 
 static gchar *shown_name(const gchar *alias, const gchar *essid)

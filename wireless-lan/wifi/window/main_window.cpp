@@ -124,8 +124,7 @@ void set_default_width(GtkWindow *window)
     GtkTreeView *view = GTK_TREE_VIEW(my_wifi->wifi_view);
     GtkTreeModel *model = gtk_tree_view_get_model(view);
     GtkTreeModel *sample = create_model();
-    g_autofree gchar *state =
-        g_strdup_printf("%s:%s", _("Connected\nIP Address"), "255.255.255.255");
+    g_autofree gchar *state = connected_state("255.255.255.255");
     GtkRequisition list, whole;
 
     model_data_new(GTK_LIST_STORE(sample), "a network's usual name", "Managed", "off", "100/100",

@@ -63,10 +63,9 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
         cell->linkstate = 1;
         connect_index = i;
 
-        g_autofree gchar *text =
-            iface->address[0] == '\0'
-                ? g_strdup(_("Connected\nIP address invalid"))
-                : g_strdup_printf("%s:%s", _("Connected\nIP Address"), iface->address);
+        g_autofree gchar *text = iface->address[0] == '\0'
+                                     ? g_strdup(_("Connected\nIP address invalid"))
+                                     : connected_state(iface->address);
 
         copy_field(status, size, text);
         debug_line("connect_index[%d] BUFFER:%s", connect_index, status);
