@@ -3,7 +3,7 @@
 #include <cerrno>
 #include <cstdio>
 
-#include <sys/stat.h>
+#include <fcntl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -45,12 +45,15 @@ gchar *iwset_command(const char *name, const WIFI_CELL *cell)
 
 void leave_text_for_scripts(const char *text, const char *path, guint mode)
 {
-    // mknod makes a plain file as open(O_EXCL) does, and needs no descriptor.
     unlink(path);
-    if (mknod(path, S_IFREG | mode, 0) != 0) {
+
+    const int fd = open(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
+
+    if (fd < 0) {
         debug_line("%s is not written: %s", path, g_strerror(errno));
         return;
     }
+    close(fd);
 
     g_autofree gchar *command = echo_command(text, path);
 
