@@ -18,7 +18,7 @@
 // The window waits for the answer, so it must come soon.
 static const gint64 ANSWER_LIMIT_US = 2 * G_USEC_PER_SEC;
 static const gsize ADDRESS_LENGTH = 17; // six pairs and five colons
-static const char REASON_FILE[] = "/run/wireless-lan/reason";
+constexpr char REASON_FILE[] = "/run/wireless-lan/reason";
 static const gsize REASON_SIZE = 256; // of its one line, with the terminator
 
 static const char *device_path = "";

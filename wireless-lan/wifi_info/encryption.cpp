@@ -7,7 +7,7 @@
 #include "wifi.h"
 
 // By t_encmode and encryption_words.
-static const char *const WORDS[][3] = {
+constexpr const char *WORDS[][3] = {
     {"off", "off", "ENC_OFF"},
     {"on", "open", "ENC_OPEN"},
     {nullptr, "restricted", "ENC_RESTRICTED"},

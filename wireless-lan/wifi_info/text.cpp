@@ -6,7 +6,7 @@
 
 #include <sys/stat.h>
 
-static const char WHITE_SPACE[] = " \t\n\v\f\r";
+constexpr char WHITE_SPACE[] = " \t\n\v\f\r";
 
 // How many of the first `length` bytes are whole characters; `text` is longer than that.
 static gsize whole_characters(const char *text, gsize length)

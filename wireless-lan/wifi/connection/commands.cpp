@@ -14,8 +14,8 @@
 #include "wifi_info/encryption.h"
 #include "wifi_info/shell.h"
 
-static const char ESSID_FILE[] = "/tmp/essid_tmp";
-static const char KEY_FILE[] = "/tmp/key_tmp";
+constexpr char ESSID_FILE[] = "/tmp/essid_tmp";
+constexpr char KEY_FILE[] = "/tmp/key_tmp";
 
 const char *client_mode(const char *mode)
 {

@@ -15,12 +15,12 @@
 #include "wifi_info/device.h"
 #include "wifi_info/text.h"
 
-static const guint PADDING = 5;
+constexpr guint PADDING = 5;
 
 // Registry keys of the dialog's controls while it is open.
-static const char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
-static const char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
-static const char ENTRY_KEY[] = "connect_key";
+constexpr char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
+constexpr char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
+constexpr char ENTRY_KEY[] = "connect_key";
 
 // The key of the preferred network that was filled in, NULL: none.
 static gchar *sel_key = nullptr;
@@ -327,7 +327,7 @@ static void cb_key_entered(GtkEntry *, gpointer dialog)
     gtk_dialog_response(GTK_DIALOG(dialog), GTK_RESPONSE_OK);
 }
 
-GtkWidget *build_encrypted_dialog(int *match_count)
+GtkWidget *create_encrypted_dialog(int *match_count)
 {
     const WIFI_CELL *cell = scanned_cell(connect_index);
 

@@ -10,7 +10,7 @@
 // Builds the dialog for the network at connect_index; `match_count` gets the number of preferred
 // networks of its name and stays as it is when the preferred lists are missing. The caller runs and
 // destroys it.
-GtkWidget *build_encrypted_dialog(int *match_count);
+GtkWidget *create_encrypted_dialog(int *match_count);
 
 // Copies the key, key management and key index of the dialog into `chosen`, whose encryption
 // becomes ENC_OPEN. Without the dialog's controls their fields stay.

@@ -22,7 +22,7 @@
 #include "wifi_info/text.h"
 
 // Long enough for the new status to be drawn before the commands block the window.
-static const guint COMMAND_DELAY_MS = 100;
+constexpr guint COMMAND_DELAY_MS = 100;
 
 // One-shot timer: takes up the network that `data` (a WIFI_CELL) is a copy of, or with NULL the one
 // at connect_index, applies it and starts the link poller. A network that is gone ends the connect
@@ -104,7 +104,7 @@ static gboolean ask_name(WIFI_CELL *chosen)
 static void connect_encrypted(WIFI_CELL *chosen)
 {
     int match_count = 0;
-    GtkWidget *dialog = begin_dialog(build_encrypted_dialog(&match_count));
+    GtkWidget *dialog = begin_dialog(create_encrypted_dialog(&match_count));
 
     gtk_widget_show_all(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {

@@ -16,7 +16,7 @@
 #include "wifi_info/device.h"
 #include "wifi_info/interfaces.h"
 
-static const int POLL_LIMIT = 21;
+constexpr int POLL_LIMIT = 21;
 
 void connect_button_sensitive(gboolean flags)
 {

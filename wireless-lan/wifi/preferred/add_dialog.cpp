@@ -42,7 +42,7 @@ void cb_configuration_add(GtkWidget *, gpointer data)
         return;
 
     GtkWidget *dialog =
-        begin_dialog(build_network_dialog(add_form, static_cast<GtkWidget *>(data)));
+        begin_dialog(create_network_dialog(add_form, static_cast<GtkWidget *>(data)));
 
     connect_network_form(add_form);
     gtk_widget_show_all(dialog);

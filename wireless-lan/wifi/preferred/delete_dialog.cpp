@@ -7,7 +7,7 @@
 #include "preferred/store.h"
 #include "wifi.h"
 
-static GtkWidget *build_delete_dialog(GtkWidget *parent, const gchar *name)
+static GtkWidget *create_delete_dialog(GtkWidget *parent, const gchar *name)
 {
     GtkWidget *dialog = create_dialog(_("Delete Network"), parent, DEFAULT_CANCEL);
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
@@ -54,7 +54,7 @@ void cb_configuration_delete(GtkWidget *, gpointer data)
         return;
 
     GtkWidget *dialog =
-        begin_dialog(build_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
+        begin_dialog(create_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
 
     gtk_widget_show_all(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist())

@@ -126,7 +126,7 @@ static GtkWidget *create_edit_buttons(GtkWidget *dialog)
     return box;
 }
 
-static GtkWidget *build_list_dialog()
+static GtkWidget *create_list_dialog()
 {
     GtkWidget *dialog = create_dialog(_("Preferred Network Setting"), nullptr, DEFAULT_CANCEL);
     GtkWidget *frame = create_titled_frame(_("Preferred Network Setting"), 5);
@@ -161,7 +161,7 @@ static void take_front_list_out()
 
 void cb_preferred_network_setting(GtkWidget *, gpointer)
 {
-    GtkWidget *dialog = begin_dialog(build_list_dialog());
+    GtkWidget *dialog = begin_dialog(create_list_dialog());
 
     gtk_widget_show_all(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {

@@ -142,7 +142,7 @@ static GtkWidget *create_key_row(const network_form &form)
     return box;
 }
 
-GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent)
+GtkWidget *create_network_dialog(const network_form &form, GtkWidget *parent)
 {
     GtkWidget *dialog = create_dialog(_(form.title), parent, DEFAULT_NONE);
     GtkWidget *frame = create_titled_frame(_("WiFi Network"), 10);

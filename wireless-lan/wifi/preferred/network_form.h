@@ -35,7 +35,7 @@ extern const network_form properties_form;
 // Builds the dialog of a form over `parent` (may be NULL) with its widgets registered and in their
 // initial state: nothing entered, WEP, "Managed", "off". The caller fills it, connects it, shows,
 // runs and destroys it.
-GtkWidget *build_network_dialog(const network_form &form, GtkWidget *parent);
+GtkWidget *create_network_dialog(const network_form &form, GtkWidget *parent);
 
 // Lets the form follow its toggles. Only a form that is filled is connected: the handlers find each
 // other's widgets by key.

@@ -87,7 +87,7 @@ void cb_configuration_properties(GtkWidget *, gpointer data)
     if (row < 0 || row >= user_wifi_count || !user_cell_lists_exist())
         return;
 
-    GtkWidget *dialog = begin_dialog(build_network_dialog(form, static_cast<GtkWidget *>(data)));
+    GtkWidget *dialog = begin_dialog(create_network_dialog(form, static_cast<GtkWidget *>(data)));
 
     fill_form(row);
     connect_network_form(form);

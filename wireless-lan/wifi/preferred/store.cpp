@@ -135,7 +135,7 @@ static GtkWidget *create_registered_list(gint columns, const char *key)
     return list;
 }
 
-static void build_lists(gboolean say)
+static void create_lists(gboolean say)
 {
     drop_list(front_list);
     drop_list(backend_list);
@@ -152,13 +152,13 @@ static void build_lists(gboolean say)
 
 GtkWidget *build_user_cell_clist()
 {
-    build_lists(TRUE);
+    create_lists(TRUE);
     return front_list;
 }
 
 void rebuild_user_cell_clist()
 {
-    build_lists(FALSE);
+    create_lists(FALSE);
 }
 
 void save_user_cell_clist()

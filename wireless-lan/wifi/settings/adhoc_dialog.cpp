@@ -30,7 +30,7 @@ void cb_active_wifi_group(GtkToggleButton *togglebutton, gpointer user_data)
     gtk_widget_set_sensitive(GTK_WIDGET(user_data), gtk_toggle_button_get_active(togglebutton));
 }
 
-static GtkWidget *new_entry(const char *text)
+static GtkWidget *create_entry(const char *text)
 {
     GtkWidget *entry = gtk_entry_new();
     g_autofree gchar *shown = displayable(text);
@@ -56,7 +56,7 @@ static gboolean is_empty(GtkWidget *entry)
     return gtk_entry_get_text_length(GTK_ENTRY(entry)) == 0;
 }
 
-static GtkWidget *new_radio(GtkWidget *box, GSList *group, const char *label)
+static GtkWidget *create_radio(GtkWidget *box, GSList *group, const char *label)
 {
     GtkWidget *radio = gtk_radio_button_new_with_label(group, label);
 
@@ -74,17 +74,17 @@ static GtkWidget *unplaced(GtkWidget *widget)
     return static_cast<GtkWidget *>(g_object_ref_sink(widget));
 }
 
-static void build_unplaced(group_form *form, const WIFI_CELL *group_info)
+static void create_unplaced(group_form *form, const WIFI_CELL *group_info)
 {
     GtkWidget *box = gtk_hbox_new(FALSE, 0);
 
-    form->key = new_entry(group_info->userkey);
+    form->key = create_entry(group_info->userkey);
     gtk_entry_set_visibility(GTK_ENTRY(form->key), FALSE);
     gtk_widget_set_sensitive(form->key, group_info->encmode != ENC_OFF);
 
-    form->rbt_off = new_radio(box, nullptr, _("off"));
-    form->rbt_open = new_radio(box, radio_group(form->rbt_off), _("open"));
-    form->rbt_res = new_radio(box, radio_group(form->rbt_off), _("restricted"));
+    form->rbt_off = create_radio(box, nullptr, _("off"));
+    form->rbt_open = create_radio(box, radio_group(form->rbt_off), _("open"));
+    form->rbt_res = create_radio(box, radio_group(form->rbt_off), _("restricted"));
     set_active(form->rbt_off, group_info->encmode == ENC_OFF);
     set_active(form->rbt_open, group_info->encmode == ENC_OPEN);
     set_active(form->rbt_res, group_info->encmode == ENC_RESTRICTED);
@@ -96,7 +96,7 @@ static void build_unplaced(group_form *form, const WIFI_CELL *group_info)
     form->unplaced[3] = unplaced(box);
 }
 
-static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
+static GtkWidget *create_essid_row(group_form *form, const WIFI_CELL *group_info)
 {
     GtkWidget *frame = create_titled_frame(_("Ad-Hoc Information"), 10);
     GtkWidget *table = gtk_table_new(8, 2, FALSE);
@@ -105,7 +105,7 @@ static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(frame), table);
 
-    form->essid = new_entry(group_info->essid);
+    form->essid = create_entry(group_info->essid);
     gtk_misc_set_alignment(GTK_MISC(label), 1.0, 0.5);
     gtk_label_set_mnemonic_widget(GTK_LABEL(label), form->essid);
     gtk_table_attach(GTK_TABLE(table), label, 0, 1, 0, 1, EXPAND_FILL, EXPAND_FILL, 5, 5);
@@ -113,7 +113,7 @@ static GtkWidget *build_essid_row(group_form *form, const WIFI_CELL *group_info)
     return frame;
 }
 
-static GtkWidget *new_group_dialog()
+static GtkWidget *create_group_dialog()
 {
     GtkWidget *dialog = create_dialog(_("Ad-Hoc Information"), nullptr, DEFAULT_NONE);
 
@@ -149,11 +149,11 @@ static gboolean store_group(GtkWidget *dialog, const group_form *form, WIFI_CELL
 void cb_adhoc_setup(GtkWidget *, gpointer user_data)
 {
     WIFI_CELL *group_info = static_cast<WIFI_CELL *>(user_data);
-    GtkWidget *dialog = begin_dialog(new_group_dialog());
+    GtkWidget *dialog = begin_dialog(create_group_dialog());
     group_form form;
 
-    build_unplaced(&form, group_info);
-    pack_content(dialog, build_essid_row(&form, group_info));
+    create_unplaced(&form, group_info);
+    pack_content(dialog, create_essid_row(&form, group_info));
     gtk_widget_show_all(dialog);
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK &&
            !store_group(dialog, &form, group_info)) {

@@ -21,7 +21,7 @@
 #include "wifi_info/text.h"
 
 // Time for the new settings to reach the interface before its address is looked at.
-static const guint FOLLOW_MS = 4000;
+constexpr guint FOLLOW_MS = 4000;
 
 const address_setting address_settings[4] = {
     {"address", &static_address, &WIFI_INTERFACE::address},

@@ -12,10 +12,10 @@
 #include "wifi_info/shell.h"
 #include "window/refresh.h"
 
-static const char CHECKING_KEY[] = "window-proc-win";
-static const char MARKER_FILE[] = "/etc/build_in_wifi";
+constexpr char CHECKING_KEY[] = "window-proc-win";
+constexpr char MARKER_FILE[] = "/etc/build_in_wifi";
 // The module takes up to six seconds until its interface appears.
-static const guint POWER_ON_MS = 6050;
+constexpr guint POWER_ON_MS = 6050;
 
 static void show_checking_window()
 {

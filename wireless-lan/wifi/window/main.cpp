@@ -14,9 +14,9 @@
 #include "window/activation.h"
 #include "window/main_window.h"
 
-static const char TEXT_DOMAIN[] = "wireless-lan";
+constexpr char TEXT_DOMAIN[] = "wireless-lan";
 // A window that is not shown (started as an icon) still gets its first scan.
-static const guint UNSEEN_MS = 1000;
+constexpr guint UNSEEN_MS = 1000;
 
 static void cb_leave(GtkWidget *, gpointer)
 {

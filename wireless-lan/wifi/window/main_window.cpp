@@ -13,11 +13,11 @@
 #include "window/refresh.h"
 #include "window/start_up.h"
 
-static const gint LIST_SIDE_WIDTH = 400; // pixels, the least
+constexpr gint LIST_SIDE_WIDTH = 400; // pixels, the least
 // Borders and shadows around the list, and the scroll bar of a long one.
-static const gint LIST_SIDE_MARGIN = 60;
+constexpr gint LIST_SIDE_MARGIN = 60;
 
-static GtkWidget *new_scrolled_window()
+static GtkWidget *create_scrolled_window()
 {
     GtkWidget *scrolled = gtk_scrolled_window_new(nullptr, nullptr);
 
@@ -36,7 +36,7 @@ static void add_button(GtkWidget *table, guint left, guint right, guint top, Gtk
 
 GtkWidget *create_left_text()
 {
-    GtkWidget *scrolled = new_scrolled_window();
+    GtkWidget *scrolled = create_scrolled_window();
     GtkWidget *frame = gtk_frame_new(_("Settings"));
     GtkWidget *table = gtk_table_new(10, 2, TRUE);
 
@@ -83,10 +83,10 @@ GtkTreeModel *create_model()
 
 GtkWidget *create_list()
 {
-    GtkWidget *scrolled = new_scrolled_window();
+    GtkWidget *scrolled = create_scrolled_window();
     GtkWidget *box = gtk_vbox_new(FALSE, 10);
     GtkWidget *label = gtk_label_new(_("Wireless network selection"));
-    GtkWidget *list_scrolled = new_scrolled_window();
+    GtkWidget *list_scrolled = create_scrolled_window();
     GtkWidget *view = gtk_tree_view_new();
     GtkTreeModel *model = create_model();
     GtkWidget *table = gtk_table_new(1, 6, TRUE);

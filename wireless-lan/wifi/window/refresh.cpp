@@ -19,7 +19,7 @@
 #include "wifi_info/text.h"
 
 // Long enough for "Searching..." to be drawn before the scan blocks the window.
-static const guint SCAN_DELAY_MS = 100;
+constexpr guint SCAN_DELAY_MS = 100;
 
 gboolean cb_refresh_network(GtkWidget *, gpointer)
 {
