@@ -1,13 +1,19 @@
 # shellcheck shell=sh
-# What iwset, lnk-ifup and lnk-ifdown share: the interface they are given, its folder under /run and
-# the processes that they leave behind. "$library" is the path of this file.
+# SPDX-License-Identifier: MIT
+# What the device's commands share: how they say what went wrong, the limit of time for what they
+# wait for, the interface they are given, its directory under /run and the processes that they leave
+# behind. Nothing here needs more than a POSIX shell and what busybox has. "$library" is the path of
+# this file.
 
 # Bytes, one language in the answers of the tools, and files for root's eyes only.
 LC_ALL=C
 export LC_ALL
-PATH=${PATH:+$PATH:}/usr/sbin:/usr/bin:/sbin:/bin
-export PATH
 umask 077
+# Root runs these commands from the environments of others: their PATH does not count.
+PATH=/usr/local/sbin:/usr/local/bin:/usr/sbin:/usr/bin:/sbin:/bin
+export PATH
+
+run_dir=/run/wireless-lan
 
 # shellcheck source=device/linux/managers.sh disable=SC2154
 . "${library%/*}/managers.sh"
@@ -23,26 +29,157 @@ fail() {
     exit "${2:-1}"
 }
 
-# use_interface NAME: checks the name, makes the interface's folder "$state" and waits for its turn
-# there (descriptor 9), so that two commands never change one interface at the same time.
-use_interface() {
+# reason WORD [DETAIL]: leaves the reason of a failure where the program finds it, one line of UTF-8.
+# The program knows these words and translates them: wrong-key, not-found, refused, rfkill-soft,
+# rfkill-hard, not-root, no-interface, no-driver, no-wep, no-hosting, no-dhcp, no-lease, busy,
+# missing-tool TOOL. Whatever else it finds it shows as it stands.
+reason() {
+    # Only root has a directory there, and a reason that cannot be left is no further failure.
+    { mkdir -p "$run_dir" && printf '%s\n' "$*" >"$run_dir/reason.$$" &&
+        mv -f "$run_dir/reason.$$" "$run_dir/reason"; } 2>/dev/null || :
+}
+
+# no_reason: forgets the reason of an earlier failure.
+no_reason() {
+    rm -f "$run_dir/reason" 2>/dev/null || :
+}
+
+# give_up WORD TEXT [DETAIL]: leaves the reason, says the text and ends the command.
+give_up() {
+    reason "$1" ${3+"$3"}
+    fail "$2"
+}
+
+# need TOOL...: ends the command at once when one of these is not installed.
+need() {
+    for tool in "$@"; do
+        command -v "$tool" >/dev/null ||
+            give_up missing-tool "$tool is missing: it has to be installed" "$tool"
+    done
+}
+
+# seconds: the time since the machine was started, which no clock that is set can change; in $now.
+seconds() {
+    read -r now _ </proc/uptime
+    now=${now%%.*}
+}
+
+# limited SECONDS COMMAND...: the command's own status, or 124 when it takes longer; then it is
+# ended, with every process that it started. It has no standard input.
+limited() {
+    limit=$1
+    shift
+    seconds
+    deadline=$((now + limit))
+    setsid "$@" </dev/null 9>&- &
+    limited=$!
+    # In a group of its own, so that its sleep can be ended with it.
+    # shellcheck disable=SC2016 # the inner shell's
+    setsid sh -c 'sleep "$1"; kill -TERM "-$2"; sleep 1; kill -KILL "-$2"' limited "$limit" "$limited" \
+        </dev/null >/dev/null 2>&1 9>&- &
+    watchdog=$!
+    wait "$limited" 2>/dev/null
+    status=$?
+    # It may not have got as far as its own group yet.
+    kill -TERM "-$watchdog" 2>/dev/null || kill "$watchdog" 2>/dev/null
+    kill -TERM "-$watchdog" 2>/dev/null
+    wait "$watchdog" 2>/dev/null
+    seconds
+    [ "$status" -ne 0 ] && [ "$now" -ge "$deadline" ] || return "$status"
+    # Whoever of its group has not ended at the first signal.
+    kill -KILL "-$limited" 2>/dev/null
+    return 124
+}
+
+# read_defaults: sets default_interface and country from /etc/default/wireless-lan. Its lines are
+# data, as in INTERFACE=wlan1 or COUNTRY="DE"; nothing in it is ever run.
+# shellcheck disable=SC2034 # the commands use them
+read_defaults() {
+    default_interface=
+    country=
+    [ -r /etc/default/wireless-lan ] || return 0
+    while read -r line || [ -n "$line" ]; do
+        value=${line#*=}
+        case $value in
+        \"*\" | \'*\')
+            value=${value#?}
+            value=${value%?}
+            ;;
+        esac
+        case $line in
+        INTERFACE=*) ! is_interface_name "$value" || default_interface=$value ;;
+        COUNTRY=[A-Z][A-Z] | COUNTRY=[\"\'][A-Z][A-Z][\"\']) country=$value ;;
+        esac
+    done </etc/default/wireless-lan
+}
+
+# is_interface_name TEXT: whether the kernel could give an interface this name, and no tool could
+# take it for something else.
+is_interface_name() {
     case $1 in
-    '' | -* | . | .. | */* | *:* | *[![:graph:]]* | ????????????????*)
-        fail 'not the name of an interface' 2
-        ;;
+    '' | -* | . | .. | */* | *:* | *[![:graph:]]* | ????????????????*) return 1 ;;
     esac
-    [ "$(id -u)" -eq 0 ] || fail 'only root may do this'
-    interface=$1
-    state=/run/wireless-lan/$1
-    mkdir -p "$state" || exit 1
-    chmod 700 /run/wireless-lan "$state"
+}
+
+# owned FILE: whether the process that the symbolic link FILE names lives; sets owner to its text.
+owned() {
+    owner=$(readlink "$1") && [ "$(start_time "${owner%:*}")" = "${owner#*:}" ]
+}
+
+# try_turn: takes the lock if nobody holds it. The kernel's lock ends with its holder (descriptor 9);
+# where there is no flock, a link that names its holder stands in for it.
+try_turn() {
+    if command -v flock >/dev/null; then
+        flock -n 9
+        return
+    fi
+    ! ln -s "$$:$(start_time $$)" "$state/owner" 2>/dev/null || return 0
+    owned "$state/owner" || {
+        # Only one can move a link that was left behind; whoever finds that it has moved another's
+        # puts it back.
+        left_behind=$owner
+        ! mv "$state/owner" "$state/owner.$$" 2>/dev/null ||
+            [ "$(readlink "$state/owner.$$")" = "$left_behind" ] ||
+            ln -s "$(readlink "$state/owner.$$")" "$state/owner"
+        rm -f "$state/owner.$$"
+    }
+    return 1
+}
+
+# take_turn: waits until no other command changes the interface, 20 seconds at most (busybox has no
+# flock that waits for a time).
+take_turn() {
     exec 9>"$state/lock"
-    flock -w 60 9 || fail "$interface: another command keeps it busy"
+    tries=100
+    until try_turn; do
+        [ "$tries" -gt 0 ] || give_up busy "$interface: another command keeps it busy"
+        tries=$((tries - 1))
+        sleep 0.2
+    done
+}
+
+# end_turn: lets the next command have its turn.
+end_turn() {
+    exec 9>&-
+    [ "$(readlink "$state/owner")" != "$$:$(start_time $$)" ] || rm -f "$state/owner"
+}
+
+# use_interface NAME: checks the name, makes the interface's directory "$state" and waits for its
+# turn there, so that two commands never change one interface at the same time.
+use_interface() {
+    is_interface_name "$1" || fail 'not the name of an interface' 2
+    [ "$(id -u)" -eq 0 ] || give_up not-root 'only root may do this'
+    interface=$1
+    state=$run_dir/$1
+    mkdir -p "$state" || exit 1
+    chmod 700 "$run_dir" "$state"
+    need ip awk
+    take_turn
 }
 
 # need_interface: fails when the interface is not there (yet, or any more).
 need_interface() {
-    [ -d "/sys/class/net/$interface" ] || fail "$interface: no such interface"
+    [ -d "/sys/class/net/$interface" ] || give_up no-interface "$interface: no such interface"
 }
 
 # start_time PID: when a living process began, in clock ticks; fails when there is none. With the

@@ -7,6 +7,7 @@ command (run) and looks at its result, at what the stubs were called with (calls
 processes and files that stay."""
 
 import os
+import re
 import shutil
 import signal
 import subprocess
@@ -30,7 +31,7 @@ STATE = "/run/wireless-lan/wlan0"
 
 ROOT = ""    # a scratch directory
 LOG = ""     # what the stubs note and answer, since the last choose()
-CHOSEN = ""  # the stubs that are installed
+CHOSEN = ""  # the stubs that are installed: where root's commands look first
 
 
 def write(path, text):
@@ -68,11 +69,13 @@ def set_up():
     """Once: a /run, /etc and /sys of our own and a /usr/sbin without DHCP clients."""
     global ROOT, CHOSEN
     ROOT = tempfile.mkdtemp(prefix="device-linux-")
-    CHOSEN = os.path.join(ROOT, "chosen")
+    sh("mount", "-t", "tmpfs", "none", ROOT)
+    CHOSEN = "/usr/local/sbin"
     sh("mount", "-t", "tmpfs", "none", "/run")
     etc = os.path.join(ROOT, "etc")
     subprocess.run(["cp", "-a", "/etc", etc], stderr=subprocess.DEVNULL, check=False)
     sh("mount", "--bind", etc, "/etc")
+    os.makedirs(os.path.join(ROOT, "logs"))
     tools = os.path.join(ROOT, "sbin")
     real = real_sbin()
     os.makedirs(tools)
@@ -82,6 +85,8 @@ def set_up():
         if name not in CLIENTS:
             os.symlink(os.path.join(real, name), os.path.join(tools, name))
     sh("mount", "--bind", tools, "/usr/sbin")
+    sh("mount", "-t", "tmpfs", "none", CHOSEN)
+    os.environ["PATH"] = "/usr/sbin:/usr/bin:/sbin:/bin"  # the tests themselves meet no stub
     sh("mount", "-t", "sysfs", "none", "/sys")
     for place in ("/var/lib/dhcp", "/var/lib/dhcpcd"):  # leases
         if os.path.isdir(place):
@@ -92,11 +97,12 @@ def set_up():
 
 
 def tear_down():
+    """Nothing is ever deleted below the scratch directory, which shows other places of the machine:
+    it is taken off with all that is mounted there."""
     clean()
     os.chdir("/")
-    for place in ("/usr/sbin", "/etc", real_sbin()):
-        subprocess.run(["umount", "-l", place], check=False)
-    shutil.rmtree(ROOT, ignore_errors=True)
+    subprocess.run(["umount", "-R", "-l", ROOT], check=False)
+    os.rmdir(ROOT)
 
 
 def clean():
@@ -137,17 +143,17 @@ def choose(*names):
     """Which of the stubs are installed; the log begins anew. What an earlier command has left in
     the background goes on in the log that it was started with."""
     global LOG
-    shutil.rmtree(CHOSEN, ignore_errors=True)
-    os.makedirs(CHOSEN)
+    for name in os.listdir(CHOSEN):
+        os.remove(os.path.join(CHOSEN, name))
     for name in names:
-        assert name in STUBS
         install(name)
-    LOG = tempfile.mkdtemp(prefix="log-", dir=ROOT)
+    LOG = tempfile.mkdtemp(dir=f"{ROOT}/logs")
 
 
-def install(name):
-    """Installs one more stub."""
-    os.symlink(os.path.join(HERE, "stub"), os.path.join(CHOSEN, name))
+def install(name, target=os.path.join(HERE, "stub")):
+    """Installs one more stub, or another program under this name."""
+    assert name in STUBS or not target.startswith(HERE)
+    os.symlink(target, os.path.join(CHOSEN, name))
 
 
 def note(file, text=""):
@@ -173,6 +179,25 @@ def make_interfaces(*interfaces):
 
 def make_wlan0():
     make_interfaces(("wlan0", 3, 1, "phy80211"))
+
+
+def in_busybox():
+    """What runs a command where busybox is the only userland; the stubs and files are the same."""
+    root = f"{ROOT}/busybox"
+    enter = ["/usr/sbin/chroot", root]
+    if os.path.isdir(root):
+        return enter
+    for name in ("bin", "sbin", "usr/bin", "usr/sbin", "tmp"):
+        os.makedirs(f"{root}/{name}")
+    libraries = subprocess.run(["ldd", "/bin/busybox"], stdout=subprocess.PIPE, check=False).stdout
+    for path in ["/bin/busybox", *re.findall(r"/\S+", libraries.decode())]:
+        os.makedirs(root + os.path.dirname(path), exist_ok=True)
+        shutil.copy(path, root + path)
+    sh(*enter, "/bin/busybox", "--install", "-s")
+    for path in ("/proc", "/sys", "/run", "/etc", "/dev", CHOSEN, TOP, f"{ROOT}/logs"):
+        os.makedirs(root + path, exist_ok=True)
+        sh("mount", "--rbind", path, root + path)
+    return enter
 
 
 # ---- running
