@@ -2,6 +2,7 @@
 
 import re
 
+from connecting import LOCKED
 from harness import wait_until
 
 MARKER = {"/etc/build_in_wifi": b""}
@@ -58,6 +59,8 @@ def test_switching_on(device):
     assert d.file("/proc/kv/iwifi") == b"1\n"
     assert app.exists() and app.sensitive("button-active-device"), "the window stays alive"
     looks = len(d.commands("cat"))
+    # Nothing else can be started meanwhile.
+    assert not any(app.sensitive(name) for name in LOCKED)
 
     # A second press during the wait does nothing.
     app.press("button-active-device")
@@ -88,6 +91,8 @@ def test_no_module(device):
     app = d.start()
     for attempt in (1, 2):
         box = app.dialog(text=MISSING)
+        # The answer gives the controls back.
+        assert all(app.sensitive(name) for name in LOCKED)
         props = app.props(box.tree())["properties"]
         assert props["message-type"] == "info" and props["modal"] and props["transient-for"] is None
         assert [one["label"] for one in box.all(type="GtkButton")] == ["gtk-ok"]

@@ -2,6 +2,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/registry.h"
 #include "base/state.h"
 #include "wifi.h"
@@ -46,7 +47,7 @@ void review_tree_vanpro(const gchar *data)
 {
     GtkListStore *store = cell_list();
 
-    if (store == nullptr)
+    if (store == nullptr || controls_held(HOLD_REFRESH))
         return;
     gtk_list_store_clear(store);
 

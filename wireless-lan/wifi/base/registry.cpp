@@ -39,12 +39,6 @@ void set_widget_sensitive(const char *key, gboolean sensitive)
         gtk_widget_set_sensitive(widget, sensitive);
 }
 
-void set_widgets_sensitive(const char *const *keys, gboolean sensitive)
-{
-    for (; *keys != nullptr; keys++)
-        set_widget_sensitive(*keys, sensitive);
-}
-
 void set_title_label(const gchar *text)
 {
     GtkWidget *label = find_widget(TITLE_LABEL);

@@ -15,14 +15,6 @@ constexpr char PREFERRED_BUTTON[] = "button-network-configure";
 constexpr char ACTIVATE_BUTTON[] = "button-active-device";
 constexpr char CONNECT_BUTTON[] = "button-connect";
 
-// The controls that go grey together, NULL at the end: while a network is hosted, while a connect
-// runs, while a scan runs.
-constexpr const char *LIST_CONTROLS[] = {NETWORK_VIEW, CONNECT_BUTTON, REFRESH_BUTTON, nullptr};
-constexpr const char *CONNECT_CONTROLS[] = {PREFERRED_BUTTON, CONNECT_BUTTON, SETTINGS_BUTTON,
-                                            REFRESH_BUTTON, nullptr};
-constexpr const char *SCAN_CONTROLS[] = {PREFERRED_BUTTON, CONNECT_BUTTON, SETTINGS_BUTTON,
-                                         REFRESH_BUTTON,   NETWORK_VIEW,   nullptr};
-
 // Registers `widget` on the main window under `key`. A later widget under the same key replaces it;
 // a widget that is destroyed leaves the registry by itself.
 void register_widget(GtkWidget *widget, const char *key);
@@ -35,9 +27,6 @@ GtkWidget *find_widget(const char *key);
 
 // Sets the sensitivity of the widget under `key`; a missing widget is skipped.
 void set_widget_sensitive(const char *key, gboolean sensitive);
-
-// The same for each of the keys in a list with NULL at its end.
-void set_widgets_sensitive(const char *const *keys, gboolean sensitive);
 
 // Sets the status label of the main window; skipped while it does not exist.
 void set_title_label(const gchar *text);

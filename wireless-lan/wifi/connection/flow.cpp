@@ -5,6 +5,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/desktop.h"
 #include "base/dialogs.h"
 #include "base/network_list.h"
@@ -24,9 +25,25 @@
 // Long enough for the new status to be drawn before the commands block the window.
 constexpr guint COMMAND_DELAY_MS = 100;
 
+// The chosen network is not in the list any more: its key is for no other.
+static void end_without_network()
+{
+    debug_line("the chosen network is gone, it is not connected");
+    if (!controls_held(HOLD_REFRESH | HOLD_HOST))
+        set_title_label(_("Wireless network selection"));
+    give_controls_back();
+}
+
+static void show_connecting()
+{
+    connect_button_sensitive(FALSE);
+    review_tree_vanpro(_("Connect network..."));
+    set_title_label(_("Connect network..."));
+}
+
 // One-shot timer: takes up the network that `data` (a WIFI_CELL) is a copy of, or with NULL the one
-// at connect_index, applies it and starts the link poller. A network that is gone ends the connect
-// and gives the controls back. Always FALSE.
+// at connect_index, applies it and starts the link poller. A network that is gone ends the connect.
+// Always FALSE.
 static gboolean do_connect(gpointer data)
 {
     const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
@@ -35,12 +52,13 @@ static gboolean do_connect(gpointer data)
         WIFI_CELL *cell = find_chosen_network(chosen);
 
         if (cell == nullptr) {
-            debug_line("the chosen network is gone, it is not connected");
-            set_title_label(_("Wireless network selection"));
-            give_controls_back();
+            end_without_network();
             return FALSE;
         }
         take_answers_over(cell, chosen);
+        // A refresh that ended meanwhile has filled the list and given the controls back.
+        if (!controls_held(HOLD_CONNECT))
+            show_connecting();
     }
     apply_configuration();
     g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
@@ -52,6 +70,9 @@ static gboolean do_disconnect(gpointer)
 {
     leave_network();
     send_status_to_desktop(STATUS_DISCONNECTED);
+    // A connect that began since the press has the list, the button and connect_index.
+    if (controls_held(HOLD_CONNECT))
+        return FALSE;
     review_tree_vanpro(_("Disconnect"));
 
     WIFI_CELL *cell = scanned_cell(connect_index);
@@ -63,16 +84,20 @@ static gboolean do_disconnect(gpointer)
     return FALSE;
 }
 
+static void wipe_copy(gpointer copy)
+{
+    explicit_bzero(copy, sizeof(WIFI_CELL));
+    g_free(copy);
+}
+
 static void start_connect(const WIFI_CELL *chosen)
 {
     WIFI_CELL *copy = g_new(WIFI_CELL, 1);
 
     *copy = *chosen;
     send_status_to_desktop(STATUS_DISCONNECTED);
-    g_timeout_add_full(G_PRIORITY_DEFAULT, COMMAND_DELAY_MS, do_connect, copy, g_free);
-    connect_button_sensitive(FALSE);
-    review_tree_vanpro(_("Connect network..."));
-    set_title_label(_("Connect network..."));
+    g_timeout_add_full(G_PRIORITY_DEFAULT, COMMAND_DELAY_MS, do_connect, copy, wipe_copy);
+    show_connecting();
     doubleclick = FALSE;
 }
 
@@ -93,14 +118,16 @@ static gboolean ask_name(WIFI_CELL *chosen)
     if (name != nullptr) {
         copy_field(cell->essid, sizeof cell->essid, name);
         copy_field(chosen->essid, sizeof chosen->essid, name);
-        printf("input essid = %s \n", chosen->essid);
+
+        g_autofree gchar *shown = printable(chosen->essid);
+
+        printf("input essid = %s \n", shown);
     }
     return TRUE;
 }
 
-// Runs the dialog of an encrypted network and connects on OK. The network is taken up afresh after
-// each dialog: when a refresh has lost it meanwhile the attempt just ends, since the key is for no
-// other network and the list already shows that this one is gone.
+// Runs the dialog of an encrypted network and connects on OK. The network is looked for afresh
+// after each dialog, since a refresh may have lost it.
 static void connect_encrypted(WIFI_CELL *chosen)
 {
     int match_count = 0;
@@ -119,9 +146,25 @@ static void connect_encrypted(WIFI_CELL *chosen)
         }
         if (find_chosen_network(chosen) != nullptr)
             start_connect(chosen);
+        else
+            end_without_network();
     }
     forget_stored_key();
     end_dialog(dialog);
+}
+
+static void connect_network(WIFI_CELL *chosen)
+{
+    if (chosen->essid[0] == '\0' && !ask_name(chosen)) {
+        end_without_network();
+        return;
+    }
+    if (strcmp(chosen->key, "on") == 0) {
+        connect_encrypted(chosen);
+        return;
+    }
+    chosen->encmode = ENC_OFF;
+    start_connect(chosen);
 }
 
 static void connect_selected()
@@ -152,22 +195,17 @@ static void connect_selected()
     // By value: what happens while a dialog is open may replace the records.
     WIFI_CELL chosen = *cell;
 
-    if (chosen.essid[0] == '\0' && !ask_name(&chosen))
-        return;
-    if (strcmp(chosen.key, "on") == 0) {
-        connect_encrypted(&chosen);
-        return;
-    }
-    chosen.encmode = ENC_OFF;
-    start_connect(&chosen);
+    connect_network(&chosen);
+    explicit_bzero(&chosen, sizeof chosen);
 }
 
 void cb_connect(GtkWidget *, gpointer)
 {
     static gboolean running = FALSE;
 
-    // While a dialog of an earlier press is open only that one is answered.
-    if (running)
+    // While a dialog of an earlier press is open only that one is answered. A double click comes
+    // here past the button, and what keeps that grey counts for both.
+    if (running || controls_held(HOLD_CHECK | HOLD_REFRESH | HOLD_CONNECT | HOLD_HOST))
         return;
     running = TRUE;
     connect_selected();

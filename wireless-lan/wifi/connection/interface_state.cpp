@@ -99,6 +99,8 @@ void get_interface_statistics_data(WIFI_INTERFACE *iface)
 {
     struct ifreq request;
 
+    if (iface == nullptr)
+        return;
     if (!request_address(iface->name, &request)) {
         perror("ioctl");
         iface->address[0] = '\0';

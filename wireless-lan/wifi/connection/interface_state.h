@@ -18,7 +18,8 @@ gboolean is_associated(const char *ap_address);
 // TRUE when the interface holds an IPv4 address (SIOCGIFADDR), whatever it is. NULL gives FALSE.
 gboolean address_valid(WIFI_INTERFACE *iface);
 
-// Reads the interface's IPv4 address into its `address`, which is emptied when it has none.
+// Reads the interface's IPv4 address into its `address`, which is emptied when it has none. NULL is
+// no interface: nothing is done.
 void get_interface_statistics_data(WIFI_INTERFACE *iface);
 
 // Sets the IPv4 address of the interface `name` to 0.0.0.0, so that the one of the former network

@@ -4,6 +4,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/desktop.h"
 #include "base/dialogs.h"
 #include "base/network_list.h"
@@ -20,9 +21,23 @@ constexpr int POLL_LIMIT = 21;
 
 void connect_button_sensitive(gboolean flags)
 {
-    set_widgets_sensitive(CONNECT_CONTROLS, flags);
+    if (flags)
+        release_controls(HOLD_CONNECT);
+    else
+        hold_controls(HOLD_CONNECT);
     get_interface();
-    set_widget_sensitive(ACTIVATE_BUTTON, my_wifi->interface_count == 0);
+    set_widget_sensitive(ACTIVATE_BUTTON,
+                         my_wifi->interface_count == 0 && !controls_held(HOLD_REFRESH));
+}
+
+// Shows how a chain stands. The list and the title of a refresh under way, and those of a window
+// in Ad-Hoc host mode, are theirs.
+static void show_state(const gchar *status, const gchar *title)
+{
+    if (controls_held(HOLD_REFRESH | HOLD_HOST))
+        return;
+    review_tree_vanpro(status);
+    set_title_label(title);
 }
 
 static void show_address()
@@ -33,7 +48,7 @@ static void show_address()
 
     g_autofree gchar *status = connected_state(iface->address);
 
-    review_tree_vanpro(status);
+    show_state(status, _("Wireless network selection"));
 }
 
 void give_controls_back()
@@ -51,17 +66,25 @@ static void tell_reason()
         show_warring_dialog(mainwindow, reason);
 }
 
+// The address of a window in Ad-Hoc host mode is the one that the device gave itself: a chain of
+// the settings ends there with nothing told and nothing shown. One that a press on Connect began
+// gives the controls back however it ends.
+static gboolean ends_unseen()
+{
+    return controls_held(HOLD_HOST) && !controls_held(HOLD_CONNECT);
+}
+
 gboolean detect_network_interface_state(gpointer)
 {
     static int count = 0; // shared by all chains
-    const WIFI_INTERFACE *iface = first_interface();
 
     debug_line("detect_network_interface_state ...");
     if (address_valid(first_interface())) {
         count = 0;
         debug_line("acquire address successed.");
+        if (ends_unseen())
+            return FALSE;
         send_status_to_desktop(STATUS_CONNECTED);
-        set_title_label(_("Wireless network selection"));
         show_address();
         set_connect_label(GTK_STOCK_DISCONNECT);
         give_controls_back();
@@ -70,13 +93,11 @@ gboolean detect_network_interface_state(gpointer)
     if (++count < POLL_LIMIT)
         return TRUE;
     count = 0;
-    // The host of an Ad-Hoc network has the address it gave itself.
-    if (iface != nullptr && iface->wifi_group_enable)
+    if (ends_unseen())
         return FALSE;
 
     debug_line("acquire address failed.");
-    review_tree_vanpro(_("Connected\nIP address invalid"));
-    set_title_label(_("Wireless network selection"));
+    show_state(_("Connected\nIP address invalid"), _("Wireless network selection"));
 
     const WIFI_CELL *selected = scanned_cell(my_wifi->cell_index);
 
@@ -92,8 +113,7 @@ static void acquire_address()
     linkconnect = TRUE;
     send_status_to_desktop(STATUS_ASSOCIATED);
     debug_line("link connected,then we will require ip address.");
-    review_tree_vanpro(_("Connected\nAcquire IP address..."));
-    set_title_label(_("Connected\nAcquire IP address..."));
+    show_state(_("Connected\nAcquire IP address..."), _("Connected\nAcquire IP address..."));
     require_ip_address();
     g_timeout_add(POLL_MS, detect_network_interface_state, nullptr);
 }
@@ -103,14 +123,13 @@ static void give_up_link()
     linkconnect = FALSE;
     send_status_to_desktop(STATUS_DISCONNECTED);
     debug_line("Not connect,return.");
-    review_tree_vanpro(_("Not Connect"));
+    // This one title is never translated; it stays as it is.
+    show_state(_("Not Connect"), "Wireless network selection");
 
     WIFI_CELL *cell = scanned_cell(connect_index);
 
     if (cell != nullptr)
         cell->linkstate = 2;
-    // In English whatever the language, so that a failed connect can be told from the idle title.
-    set_title_label("Wireless network selection");
     // doubleclick stays as it is: after a failure only the button connects again.
     connect_button_sensitive(TRUE);
     tell_reason();

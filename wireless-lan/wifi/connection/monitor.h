@@ -8,11 +8,12 @@
 
 constexpr guint POLL_MS = 2000;
 
-// Sets the sensitivity of the main window's buttons; "Active WIFI" instead follows whether an
-// interface is missing.
+// Begins (FALSE) or ends (TRUE) the time in which a connect keeps the main window's buttons grey.
+// "Active WIFI" instead follows whether an interface is missing: this runs `cat` and rewrites the
+// interface table (get_interface).
 void connect_button_sensitive(gboolean flags);
 
-// Gives the controls back at the end of a chain: a double click may connect again too.
+// Gives the controls back, and a double click may connect again too.
 void give_controls_back();
 
 // Timer: waits for an access point, 21 polls at most, then requires an address and hands over.

@@ -6,6 +6,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/desktop.h"
 #include "base/dialogs.h"
 #include "base/network_list.h"
@@ -87,7 +88,7 @@ static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gb
 static void enter_host_mode(const WIFI_INTERFACE *iface)
 {
     host_network(iface);
-    set_widgets_sensitive(LIST_CONTROLS, FALSE);
+    hold_controls(HOLD_HOST);
     set_title_label(_("Ad-Hoc Host Mode"));
     send_status_to_desktop(STATUS_ASSOCIATED);
 }
@@ -95,7 +96,7 @@ static void enter_host_mode(const WIFI_INTERFACE *iface)
 // FALSE: there is no association, so no address to ask for.
 static gboolean enter_selection_mode()
 {
-    set_widgets_sensitive(LIST_CONTROLS, TRUE);
+    release_controls(HOLD_HOST);
     set_title_label(_("Wireless network selection"));
     send_status_to_desktop(STATUS_DISCONNECTED);
     if (my_wifi->cell_count < 1)

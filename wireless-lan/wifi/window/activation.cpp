@@ -5,6 +5,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/dialogs.h"
 #include "base/registry.h"
 #include "wifi.h"
@@ -24,6 +25,7 @@ static void show_checking_window()
     GtkWidget *label = gtk_label_new(_("Checking,please wait..."));
 
     register_named_widget(window, CHECKING_KEY);
+    hold_controls(HOLD_CHECK);
     run_command("echo 1 > /proc/kv/iwifi");
     gtk_label_set_justify(GTK_LABEL(label), GTK_JUSTIFY_CENTER);
     gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
@@ -54,6 +56,7 @@ gboolean cb_check_wifi(gpointer)
     printf("proc_win=%p\n", static_cast<void *>(window));
     if (window != nullptr)
         gtk_widget_destroy(window);
+    release_controls(HOLD_CHECK);
 
     get_interface();
     if (my_wifi->interface_count < 1) {

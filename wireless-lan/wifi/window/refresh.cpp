@@ -5,6 +5,7 @@
 
 #include <glib/gi18n.h>
 
+#include "base/controls.h"
 #include "base/desktop.h"
 #include "base/dialogs.h"
 #include "base/network_list.h"
@@ -21,11 +22,18 @@
 // Long enough for "Searching..." to be drawn before the scan blocks the window.
 constexpr guint SCAN_DELAY_MS = 100;
 
+static void show_no_device()
+{
+    set_title_label(_("No Wireless Device"));
+    show_warring_dialog(mainwindow, _("No Wireless Device"));
+    debug_line("No interface");
+}
+
 gboolean cb_refresh_network(GtkWidget *, gpointer)
 {
     debug_line("Searching...");
     if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
-        set_widgets_sensitive(LIST_CONTROLS, FALSE);
+        hold_controls(HOLD_HOST);
         set_title_label(_("Ad-Hoc Host Mode"));
         return FALSE;
     }
@@ -34,14 +42,13 @@ gboolean cb_refresh_network(GtkWidget *, gpointer)
     get_interface();
     printf("my_wifi->interface_count = %d\n", my_wifi->interface_count);
     if (my_wifi->interface_count < 1) {
-        set_title_label(_("No Wireless Device"));
-        show_warring_dialog(mainwindow, _("No Wireless Device"));
-        debug_line("No interface");
+        show_no_device();
         return FALSE;
     }
 
     clear_network_list();
-    set_widgets_sensitive(SCAN_CONTROLS, FALSE);
+    release_controls(HOLD_HOST);
+    hold_controls(HOLD_REFRESH);
     set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
     g_timeout_add(SCAN_DELAY_MS, cb_refresh, nullptr);
     return FALSE;
@@ -69,8 +76,11 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
 
         copy_field(status, size, text);
         debug_line("connect_index[%d] BUFFER:%s", connect_index, status);
+
+        g_autofree gchar *essid = printable(cell->essid);
+
         fprintf(stderr, "%smatched connect info:state [%d],essid:[%s]", DEBUG_PREFIX,
-                cell->linkstate, cell->essid);
+                cell->linkstate, essid);
     }
     if (connect_index == -1)
         copy_field(status, size, _("Disconnect"));
@@ -81,9 +91,19 @@ gboolean cb_refresh(gpointer)
     WIFI_INTERFACE *iface = first_interface();
     char status[STATUS_TEXT_SIZE] = "";
 
+    // The settings were confirmed meanwhile, and the device hosts a network: nothing is scanned.
+    if (controls_held(HOLD_HOST)) {
+        release_controls(HOLD_REFRESH);
+        return FALSE;
+    }
+    if (iface == nullptr) {
+        release_controls(HOLD_REFRESH);
+        show_no_device();
+        return FALSE;
+    }
     send_status_to_desktop(STATUS_SCANNING);
     get_cell(iface);
-    set_widgets_sensitive(SCAN_CONTROLS, TRUE);
+    release_controls(HOLD_REFRESH | HOLD_CONNECT);
     set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
     my_wifi->cell_index = -1;
     if (my_wifi->cell_count < 1) {
