@@ -4,26 +4,41 @@
 
 #include "base/state.h"
 #include "wifi.h"
+#include "wifi_info/text.h"
 
-static gboolean same_network(const WIFI_CELL *a, const WIFI_CELL *b)
+static gboolean is_network(const WIFI_CELL *cell, const char *address, const char *essid)
 {
-    return strcmp(a->address, b->address) == 0 && strcmp(a->essid, b->essid) == 0;
+    return strcmp(cell->address, address) == 0 && strcmp(cell->essid, essid) == 0;
+}
+
+// The index of the network that is listed under this address and name, -1 for none. One access
+// point can be in the list twice, so the index in hand goes first.
+static int find_network(const char *address, const char *essid)
+{
+    const WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (cell != nullptr && is_network(cell, address, essid))
+        return connect_index;
+    for (int index = 0; (cell = scanned_cell(index)) != nullptr; index++)
+        if (is_network(cell, address, essid))
+            return index;
+    return -1;
 }
 
 WIFI_CELL *find_chosen_network(const WIFI_CELL *chosen)
 {
-    int index = connect_index;
+    int index = find_network(chosen->address, chosen->essid);
+
+    // A scan lists a hidden network without the name that the user typed.
+    if (index < 0)
+        index = find_network(chosen->address, "");
+    if (index < 0)
+        return nullptr;
+
     WIFI_CELL *cell = scanned_cell(index);
 
-    // One access point can be in the list twice, so the index in hand goes first.
-    if (cell == nullptr || !same_network(cell, chosen)) {
-        for (index = 0; (cell = scanned_cell(index)) != nullptr; index++)
-            if (same_network(cell, chosen))
-                break;
-        if (cell == nullptr)
-            return nullptr;
-    }
     connect_index = index;
+    copy_field(cell->essid, sizeof cell->essid, chosen->essid);
     return cell;
 }
 

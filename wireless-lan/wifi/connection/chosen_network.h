@@ -8,8 +8,9 @@
 #include "wifi.h"
 
 // The scanned network that `chosen` is a copy of; connect_index becomes its index, since a refresh
-// may have replaced the records after the copy was made. NULL, with nothing changed: no network
-// with this access point and name is there any more, and its key is for no other.
+// may have replaced the records after the copy was made. A network with this access point that is
+// listed without a name is the same one, and its record gets the copy's name. NULL, with nothing
+// changed: no such network is there any more, and its key is for no other.
 WIFI_CELL *find_chosen_network(const WIFI_CELL *chosen);
 
 // Copies the user's answers (encryption and key) from `chosen` into the record.

@@ -232,7 +232,7 @@ static void read_active(const char *key, guint32 *field, const char *name)
 
 void read_answers(WIFI_CELL *chosen)
 {
-    g_autofree gchar *key = entered_key();
+    WIPED gchar *key = entered_key();
 
     read_active(AUTHENTICATION_KEY, &chosen->key_mgmt, "key_mgmt");
     read_active(KEY_INDEX_KEY, &chosen->key_index, "do connect key_index");
@@ -254,7 +254,7 @@ gboolean is_new_configuration(const WIFI_CELL *chosen, int match_count)
 
 void forget_stored_key()
 {
-    g_clear_pointer(&sel_key, g_free);
+    wipe_text(&sel_key);
 }
 
 static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
