@@ -774,11 +774,15 @@ static void run_sequence()
 
 static int living = 0; // widgets that were seen and are not finalized
 
+static void count_finalized(gpointer, GObject *)
+{
+    living--;
+}
+
 static void count_living(GtkWidget *widget, gpointer)
 {
     living++;
-    g_object_weak_ref(
-        G_OBJECT(widget), [](gpointer, GObject *) { living--; }, nullptr);
+    g_object_weak_ref(G_OBJECT(widget), count_finalized, nullptr);
     if (GTK_IS_CONTAINER(widget))
         gtk_container_forall(GTK_CONTAINER(widget), count_living, nullptr);
 }
