@@ -3,9 +3,11 @@ r"""The records beside the inputs of this directory, worked out from each input 
 the program.
 
 scan/NAME.txt is the output of iwlist, scan/NAME.cells its networks; interfaces/NAME.txt is the
-kernel's list, interfaces/NAME.names its interfaces. Bytes that are no printable ASCII, and the
+kernel's list, interfaces/NAME.names its interfaces; iw/NAME.txt is the output of the tool iw,
+iw/NAME.cells its networks. Bytes that are no printable ASCII, and the
 backslash, are written as \xNN. The inputs named real-... are the unchanged output of Wireless-Tools
-30 and of Linux 6.1 on simulated radios (mac80211_hwsim).
+30 and of Linux 6.1 on simulated radios (mac80211_hwsim); so are all of iw, whose names tell the
+kernel and which tests/lab/record-scans makes.
 
 For a new input: pytest tests/goldens --write-goldens"""
 
@@ -14,6 +16,7 @@ import pathlib
 import pytest
 
 from support.grammar import INTERFACE_LINE, SPACES, pieces, read_interfaces, read_scan
+from support.iw import read_iw, records
 
 HERE = pathlib.Path(__file__).parent
 INPUTS = sorted(HERE.glob("*/*.txt"))
@@ -65,17 +68,26 @@ def interfaces_of(text):
         shown("name", fit(name, INTERFACES)) for name in (names + [left])[:INTERFACES]]
 
 
+def lines(rule):
+    return lambda text: "\n".join(rule(text)) + "\n"
+
+
+# What becomes of the inputs of a directory, and the suffix of the files with it.
+RULES = {
+    "scan": (lines(networks_of), ".cells"),
+    "interfaces": (lines(interfaces_of), ".names"),
+    "iw": (lambda text: records(read_iw(text)), ".cells"),
+}
+
+
 def test_there_are_inputs():
-    assert {path.parent.name for path in INPUTS} == {"scan", "interfaces"}
+    assert {path.parent.name for path in INPUTS} == {"scan", "interfaces", "iw"}
 
 
 @pytest.mark.parametrize("path", INPUTS, ids=lambda path: f"{path.parent.name}/{path.stem}")
 def test_records(path, request):
-    if path.parent.name == "scan":
-        lines, golden = networks_of(path.read_bytes()), path.with_suffix(".cells")
-    else:
-        lines, golden = interfaces_of(path.read_bytes()), path.with_suffix(".names")
-    text = "\n".join(lines) + "\n"
+    text, golden = RULES[path.parent.name]
+    text, golden = text(path.read_bytes()), path.with_suffix(golden)
     if request.config.getoption("--write-goldens"):
         golden.write_text(text, encoding="ascii")
     assert golden.read_text(encoding="ascii") == text
