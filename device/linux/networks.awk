@@ -1,8 +1,9 @@
 # SPDX-License-Identifier: MIT
-# The awk program of iwlist: the answer of the real iwlist in the form that the program reads.
+# The networks of a scan in the form that the program reads. Read by awk together with the rules of
+# one of the tools, from-iwlist.awk or from-iw.awk: these set the variables of the network that is
+# being read (see begin_network) and call end_network after its last line.
 #
-# One network a record: the seven lines in the program's order, "Bit Rates:" last because it is
-# what closes a network there. Names travel as hexadecimal digits and are put into words at the end.
+# Names travel as hexadecimal digits and are put into words at the end.
 
 BEGIN {
     for (i = 0; i < 256; i++) {
@@ -12,9 +13,13 @@ BEGIN {
             code[char[i]] = sprintf("%02X", i)
         }
     }
+    margin = "                    "
+    # The window keeps no more networks, and a field of it no more bytes of a name.
+    most = 128
+    longest = 127
 }
 
-# The bytes of a name as iwlist prints it: \xNN where it escaped one, the character otherwise.
+# The bytes of a name as the tools print it: \xNN where they escaped one, the character otherwise.
 function bytes_of_text(text,    out, hex) {
     out = ""
     while (text != "") {
@@ -58,8 +63,8 @@ function printable(b, i, n,    more, c, k) {
 
 # The text of a name: its characters where they are printable, \xNN for any other byte, for a
 # backslash that would read as the start of one, and for blanks that the program cuts off (at either
-# end) or cuts at (the eighth of a run). iwset turns each \xNN back, so that every name can be
-# joined exactly.
+# end) or cuts at (the eighth of a run). Where that is longer than the program's field, \X and the
+# digits of all bytes. iwset turns each back, so that every name can be joined exactly.
 function text_of_bytes(hex,    b, n, i, k, size, out, blanks, tail) {
     n = length(hex) / 2
     for (i = 0; i < n; i++)
@@ -79,17 +84,26 @@ function text_of_bytes(hex,    b, n, i, k, size, out, blanks, tail) {
             for (k = 0; k < size; k++)
                 out = out char[b[i + k]]
     }
-    return out
+    return length(out) > longest ? "\\X" hex : out
+}
+
+# Begins the network of an access point. The rules fill in: name (hexadecimal digits), mode and
+# frequency (as they are to stand in their lines), quality (as it is to stand, and its per cent in
+# strength), encrypted ("on", "off" or "" when unknown), authentication ("WPA", "WEP" or "") and
+# rates.
+function begin_network(of) {
+    open = 1
+    address = of
+    name = mode = frequency = quality = strength = encrypted = authentication = rates = ""
 }
 
 # Files the network that has been read. An access point that hides its name stands in the list a
 # second time once a probe has found the name: the entry with the name takes the place of the one
 # without.
-function file(    name, key) {
+function end_network(    key, slot) {
     if (!open)
         return
     open = 0
-    name = element != "" ? element : bytes_of_text(essid)
     if (name ~ /^(00)*$/)
         name = ""
     key = address " " name
@@ -102,93 +116,26 @@ function file(    name, key) {
     seen[key] = slot
     if (name != "")
         named[address] = 1
-    record[slot] = sprintf(" - Address: %s\n%sESSID:\"%s\"\n", address, margin, text_of_bytes(name))
-    if (mode != "")
-        record[slot] = record[slot] margin mode "\n"
-    if (frequency != "")
-        record[slot] = record[slot] margin frequency "\n"
-    if (quality != "")
-        record[slot] = record[slot] margin quality "\n"
-    if (encryption != "")
-        record[slot] = record[slot] margin encryption "\n"
-    record[slot] = record[slot] margin "Bit Rates:" (rates != "" ? rates : "unknown")
+    percent[slot] = strength == "" ? -1 : int(strength)
+    # "Bit Rates:" last, because it is what closes a network in the program; it reads 511 bytes of a
+    # line, and an access point may say that it knows 255 rates.
+    record[slot] = " - Address: " address "\n" line_of(1, "ESSID:\"" text_of_bytes(name) "\"") \
+        line_of(mode != "", "Mode:" mode) line_of(frequency != "", "Frequency:" frequency) \
+        line_of(quality != "", "Quality:" quality) \
+        line_of(encrypted != "", "Encryption key:" encrypted) \
+        line_of(encrypted == "on" && authentication != "", "Authentication:" authentication) \
+        margin "Bit Rates:" (rates != "" ? substr(rates, 1, 400) : "unknown")
 }
 
-BEGIN {
-    margin = "                    "
+function line_of(known, text) {
+    return known ? margin text "\n" : ""
 }
 
-/^ +Cell [0-9]+ - Address: / {
-    file()
-    open = 1
-    address = $5
-    essid = element = mode = frequency = quality = encryption = rates = ""
-    named_line = more_rates = 0
-    next
-}
-
-!open {
-    if ($0 !~ /Cell/)
-        print
-    next
-}
-
-{
-    line = $0
-    sub(/^ +/, "", line)
-}
-
-# The rest of a "Bit Rates:" line stands below it, indented further.
-more_rates && line ~ /^[0-9]/ {
-    rates = rates "; " line
-    next
-}
-
-{
-    more_rates = 0
-}
-
-line ~ /^ESSID:/ && !named_line {
-    named_line = 1
-    if (match(line, /".*"/))
-        essid = substr(line, RSTART + 1, RLENGTH - 2)
-}
-
-# The element that carried the name, where the driver hands it on, is exact; the text is not: a
-# name that ends in a backslash, x and two digits is printed as if it ended in an escaped byte.
-line ~ /^IE: Unknown: 00/ && element == "" {
-    hex = substr(line, 14)
-    if (length(hex) == 4 + 2 * byte[substr(hex, 3, 2)])
-        element = substr(hex, 5)
-}
-
-line ~ /^Mode:/ {
-    mode = line
-}
-
-line ~ /^Frequency:/ {
-    frequency = line
-}
-
-# The equals sign says no more than that the value is fresh.
-line ~ /^Quality[:=]/ {
-    quality = line
-    gsub(/=/, ":", quality)
-}
-
-# A key that iwlist could read would stand in the place of "on".
-line ~ /^Encryption key:/ {
-    encryption = line ~ /:off/ ? "Encryption key:off" : "Encryption key:on"
-}
-
-line ~ /^Bit Rates:/ {
-    rates = (rates != "" ? rates "; " : "") substr(line, 11)
-    more_rates = 1
-}
-
-END {
-    file()
-    for (i = 1; i <= count; i++)
-        printf "          Cell %02d%s\n", i, record[i]
+# The strongest first; among equals, in the order in which they came.
+function print_networks(    i, p, shown) {
+    for (p = 100; p >= -1; p--)
+        for (i = 1; i <= count && shown < most; i++)
+            if (percent[i] == p || p == 100 && percent[i] > p)
+                printf "          Cell %02d%s\n", ++shown, record[i]
     print ""
 }

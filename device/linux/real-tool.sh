@@ -1,24 +1,30 @@
 # shellcheck shell=sh
-# For the commands of this folder that stand in front of a tool of the same name.
+# SPDX-License-Identifier: MIT
+# For the commands of this directory that stand in front of a tool of the same name. "$own" is this
+# directory.
 
-# Prints the path of the first program called $1 on PATH that does not lie in this command's own
-# folder; fails when there is none.
+# real_tool NAME: prints the path of the system's program NAME, the first that does not lie in this
+# directory; fails when there is none. The caller's PATH does not count: it is root who runs this.
 real_tool() {
-    case $0 in
-    */*) own=$(CDPATH='' cd -P -- "${0%/*}" && pwd) ;;
-    *) own=$(pwd -P) ;;
-    esac
-    left=${PATH-}:/usr/sbin:/usr/bin:/sbin:/bin:
-    while [ -n "$left" ]; do
-        folder=${left%%:*}
-        left=${left#*:}
-        : "${folder:=.}"
-        if [ -f "$folder/$1" ] && [ -x "$folder/$1" ] &&
-            [ "$(CDPATH='' cd -P -- "$folder" && pwd)" != "$own" ]; then
-            printf '%s\n' "$folder/$1"
+    # shellcheck disable=SC2154 # the command's
+    own_path=$(CDPATH='' cd -P -- "$own" && pwd)
+    for place in /usr/local/sbin /usr/local/bin /usr/sbin /usr/bin /sbin /bin; do
+        if [ -f "$place/$1" ] && [ -x "$place/$1" ] &&
+            [ "$(CDPATH='' cd -P -- "$place" && pwd)" != "$own_path" ]; then
+            printf '%s\n' "$place/$1"
             return 0
         fi
     done
-    printf '%s: no other %s on PATH\n' "$1" "$1" >&2
     return 1
+}
+
+# pass_on NAME ARGUMENT...: becomes the system's program NAME.
+pass_on() {
+    name=$1
+    shift
+    real=$(real_tool "$name") || {
+        printf '%s: there is no other %s on this system\n' "$name" "$name" >&2
+        exit 127
+    }
+    exec "$real" "$@"
 }

@@ -21,4 +21,6 @@ interfaces = read_interfaces
 
 def name_bytes(text):
     """The bytes that a name of the list stands for."""
+    if re.fullmatch(rb"\\X[0-9A-F]{64}", text):
+        return bytes.fromhex(text[2:].decode())
     return re.sub(rb"\\x([0-9A-Fa-f]{2})", lambda m: bytes.fromhex(m[1].decode()), text)

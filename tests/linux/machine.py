@@ -6,6 +6,7 @@ A test chooses the tools that are installed (choose), tells the stubs what to an
 command (run) and looks at its result, at what the stubs were called with (calls) and at the
 processes and files that stay."""
 
+import glob
 import os
 import re
 import shutil
@@ -20,7 +21,8 @@ DEVICE = os.path.join(TOP, "device", "linux")
 SAMPLES = os.path.join(HERE, "samples")
 EXPECTED = os.path.join(HERE, "expected")
 
-COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "iwlist", "cat", "udhcpc-script")
+COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "iwlist", "cat", "ap-address",
+            "udhcpc-script")
 LIBRARIES = ("wireless-lan.sh", "managers.sh", "wpa-network.sh", "real-tool.sh", "dhclient-hook")
 STUBS = ("iwlist", "cat", "wpa_supplicant", "wpa_cli", "ip", "iw", "dhcpcd", "udhcpc", "dhclient",
          "nmcli", "connmanctl")
@@ -30,6 +32,7 @@ AWKS = ("mawk", "gawk", "busybox")
 STATE = "/run/wireless-lan/wlan0"
 
 ROOT = ""    # a scratch directory
+_hidden = []  # tools of /usr/sbin that the test is without
 LOG = ""     # what the stubs note and answer, since the last choose()
 CHOSEN = ""  # the stubs that are installed: where root's commands look first
 
@@ -124,8 +127,12 @@ def clean():
     for name in os.listdir("/run"):
         path = os.path.join("/run", name)
         shutil.rmtree(path) if os.path.isdir(path) and not os.path.islink(path) else os.remove(path)
-    if os.path.exists("/etc/wireless.conf"):
-        os.remove("/etc/wireless.conf")
+    for path in ("/etc/wireless.conf", "/etc/default/wireless-lan"):
+        if os.path.exists(path):
+            os.remove(path)
+    while _hidden:
+        name = _hidden.pop()
+        os.symlink(os.path.join(real_sbin(), name), f"/usr/sbin/{name}")
     choose()
 
 
@@ -154,6 +161,13 @@ def install(name, target=os.path.join(HERE, "stub")):
     """Installs one more stub, or another program under this name."""
     assert name in STUBS or not target.startswith(HERE)
     os.symlink(target, os.path.join(CHOSEN, name))
+
+
+def hide(name):
+    """For this test a tool of /usr/sbin is not installed."""
+    if os.path.lexists(f"/usr/sbin/{name}"):
+        os.remove(f"/usr/sbin/{name}")
+        _hidden.append(name)
 
 
 def note(file, text=""):
@@ -251,6 +265,12 @@ def supplicants():
 
 def clients():
     return numbers("clients")
+
+
+def running(name):
+    """The numbers of the processes that were started as NAME."""
+    return [path.split("/")[2] for path in glob.glob("/proc/[0-9]*/cmdline")
+            if os.path.basename(read(path).split(b"\0")[0]) == name.encode()]
 
 
 def alive(pid):

@@ -2,11 +2,14 @@
 """Scans for the tests: names that a careless program would spoil, answers of the real iwlist that
 carry them, and the strict form of our own."""
 
+import os
 import random
 import re
+import shutil
 
 import board
-from machine import path_line, note, run
+import machine
+from machine import awk_directory, install, note, run
 
 HOSTILE = [
     b"cafe", b"home net", b"a\"b$(id)", b"`id`", b"$HOME", b"\\", b"\\\\", b"end\\", b"'", b"\"",
@@ -76,28 +79,61 @@ def numbered(names):
     return [(address_of(number), name) for number, name in enumerate(names)]
 
 
-def convert(text, awk=None):
-    """What the iwlist of the device makes of an answer of the real one, with the awk of a
-    directory."""
+def use_awk(name):
+    """The commands find this awk."""
+    install("awk", f"{awk_directory(name)}/awk")
+
+
+def patient_for_a_second(command):
+    """A command of the device whose limit is a second, so that no test waits longer for it."""
+    directory = os.path.join(machine.ROOT, "hasty")
+    shutil.copytree(machine.DEVICE, directory, dirs_exist_ok=True)
+    path = os.path.join(directory, command)
+    text = machine.read(path)
+    hasty, changed = re.subn(rb"^patience=\d+$", b"patience=1", text, flags=re.M)
+    assert changed == 1
+    machine.write(path, hasty)
+    return path
+
+
+def convert(text):
+    """What the iwlist of the device makes of an answer of the real one."""
     note("scan", text)
-    status, out, err = run("iwlist", "wlan0", "scan", path=path_line(*([awk] if awk else [])))
+    status, out, err = run("iwlist", "wlan0", "scan")
     assert (status, err) == (0, b"")
     return out
 
 
-def assert_form(out):
-    """One line a keyword, in order, nothing else."""
+def lines_of(out):
+    """The lines of each network, without their margin; nothing else may be there."""
     lines = out.split(b"\n")
     assert lines[0].endswith(b"Scan completed :")
     assert lines[-2:] == [b"", b""]
-    wanted = (b"          Cell %02d - Address: ", b"ESSID:", b"Mode:", b"Frequency:", b"Quality:",
-              b"Encryption key:", b"Bit Rates:")
-    body = lines[1:-2]
-    assert len(body) % len(wanted) == 0
-    for place, line in enumerate(body):
-        number, keyword = place // len(wanted) + 1, wanted[place % len(wanted)]
-        start = keyword % number if b"%" in keyword else b" " * 20 + keyword
-        assert line.startswith(start)
+    networks = []
+    for line in lines[1:-2]:
+        if line.startswith(b"          Cell "):
+            networks.append([])
+            assert line.startswith(b"          Cell %02d - Address: " % len(networks))
+            networks[-1].append(line.strip().split(b" - ")[1])
+        else:
+            assert line.startswith(b" " * 20) and line[20:21] != b" "
+            networks[-1].append(line[20:])
+    return networks
+
+
+def assert_form(out):
+    """One line a keyword, in order."""
+    for lines in lines_of(out):
+        wanted = [b"Address", b"ESSID", b"Mode", b"Frequency", b"Quality", b"Encryption key",
+                  b"Bit Rates"]
+        if b"Encryption key:on" in lines:
+            assert lines.pop(6) in (b"Authentication:WPA", b"Authentication:WEP")
+        assert [line.split(b":")[0] for line in lines] == wanted
+
+
+def portions(names):
+    """So many at once as the list holds."""
+    return [names[start:start + 128] for start in range(0, len(names), 128)]
 
 
 def assert_names(out, names):
