@@ -17,6 +17,8 @@ run_dir=/run/wireless-lan
 
 # shellcheck source=device/linux/managers.sh disable=SC2154
 . "${library%/*}/managers.sh"
+# shellcheck source=device/linux/automatic.sh
+. "${library%/*}/automatic.sh"
 
 # say TEXT: one line on standard error. No text here ever holds a key.
 say() {
@@ -230,6 +232,7 @@ drop_address() {
 
 # leave_network: ends the supplicant, which leaves its network, and forgets the key.
 leave_network() {
+    stop_following
     stop_process supplicant.pid
     rm -f "$state/wpa_supplicant.conf" "$state/wpa_supplicant.pid"
 }

@@ -14,31 +14,35 @@ hex() {
     printf '%s' "$1" | od -An -v -tx1 | tr -d ' \n'
 }
 
-# name_hex NAME: the bytes of a name; \xNN, which the list shows for a byte that cannot be shown,
-# stands for that byte.
+# For awk: unescaped(DIGITS), the bytes of a name from the hexadecimal digits of its text. \xNN,
+# which the list shows for a byte that cannot be shown, stands for that byte.
+unescape='
+function value_of(code) {
+    if (code ~ /^3[0-9]$/)
+        return substr(code, 2)
+    if (code ~ /^[46][1-6]$/)
+        return substr("abcdef", substr(code, 2), 1)
+    return ""
+}
+function unescaped(text,    i, high, low, result) {
+    result = ""
+    for (i = 1; i < length(text); i += 2) {
+        high = value_of(substr(text, i + 4, 2))
+        low = value_of(substr(text, i + 6, 2))
+        if (substr(text, i, 4) == "5c78" && high != "" && low != "") {
+            result = result high low
+            i += 6
+        } else
+            result = result substr(text, i, 2)
+    }
+    return result
+}'
+
+# name_hex NAME: the bytes of a name as the list shows it.
 name_hex() {
-    printf '%s' "$1" | od -An -v -tx1 | awk '
-    function digit(code) {
-        if (code ~ /^3[0-9]$/)
-            return substr(code, 2)
-        if (code ~ /^[46][1-6]$/)
-            return substr("abcdef", substr(code, 2), 1)
-        return ""
-    }
+    hex "$1" | awk "$unescape"'
     {
-        for (i = 1; i <= NF; i++)
-            byte[n++] = $i
-    }
-    END {
-        for (i = 0; i < n; i++) {
-            high = digit(byte[i + 2])
-            low = digit(byte[i + 3])
-            if (i + 3 < n && byte[i] byte[i + 1] == "5c78" && high != "" && low != "") {
-                printf "%s", high low
-                i += 3
-            } else
-                printf "%s", byte[i]
-        }
+        print unescaped($0)
     }'
 }
 
@@ -115,6 +119,15 @@ wpa_lines() {
     else
         printf 'key_mgmt=%s\nieee80211w=1\npsk=%s\n' "$management" "$psk"
         [ -z "$phrase" ] || printf 'sae_password=%s\n' "$phrase"
+    fi
+}
+
+# choose_security: "off" is what the program gives for no key. A hosted network is given no other,
+# whatever its encryption, and is open.
+choose_security() {
+    if [ "$key" = off ] && { [ "$security" = wep ] || [ "$encryption" = off ]; } ||
+        [ "$security:$encryption" = wep:off ]; then
+        security=open
     fi
 }
 

@@ -21,9 +21,10 @@ DEVICE = os.path.join(TOP, "device", "linux")
 SAMPLES = os.path.join(HERE, "samples")
 EXPECTED = os.path.join(HERE, "expected")
 
-COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "iwlist", "cat", "ap-address",
-            "udhcpc-script")
-LIBRARIES = ("wireless-lan.sh", "managers.sh", "wpa-network.sh", "real-tool.sh", "dhclient-hook")
+COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "wireless-lan-auto", "iwlist", "cat", "ap-address",
+            "udhcpc-script", "wpa-action")
+LIBRARIES = ("wireless-lan.sh", "automatic.sh", "managers.sh", "preferred.sh", "settings.sh",
+             "wpa-network.sh", "real-tool.sh", "dhclient-hook")
 STUBS = ("iwlist", "cat", "wpa_supplicant", "wpa_cli", "ip", "iw", "dhcpcd", "udhcpc", "dhclient",
          "nmcli", "connmanctl")
 CLIENTS = ("dhcpcd", "udhcpc", "dhclient")

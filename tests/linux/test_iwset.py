@@ -293,7 +293,7 @@ def test_follower_of_an_old_network_leaves_the_new_one_alone():
 def test_no_program_is_given_a_key(label, key, options):
     """Not in its arguments, not in its environment; one file holds it until the network is left."""
     trace = f"{machine.ROOT}/trace {label}"
-    # strace follows the supplicant too, for as long as that lives.
+    # strace follows the supplicant and its wpa_cli too, for as long as they live.
     tracer = threading.Thread(target=iwset, args=("home net", key), kwargs=dict(options, wrap=[
         "strace", "-f", "-v", "-s", "4096", "-e", "trace=execve,execveat", "-o", trace]))
     tracer.start()
@@ -305,7 +305,7 @@ def test_no_program_is_given_a_key(label, key, options):
     assert wait_for(ended)
     held = [path for path in glob.glob("/run/**", recursive=True)
             if os.path.isfile(path) and key.encode() in read(path)]
-    for pid in supplicants():
+    for pid in supplicants() + machine.numbers("followers"):
         os.kill(pid, 9)
     tracer.join()
     lines = [line for line in read(trace).splitlines() if b"exec" in line]

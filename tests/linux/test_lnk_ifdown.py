@@ -21,7 +21,7 @@ def test_network_is_left_and_its_key_forgotten():
     assert not alive(supplicants()[-1])
     assert [b" ".join(call) for call in calls("iw")] == [b"iw dev wlan0 disconnect",
                                                          b"iw dev wlan0 ibss leave"]
-    assert sorted(os.listdir(STATE)) == ["lock"]
+    assert sorted(os.listdir(STATE)) == ["choice", "lock"]
     assert run("lnk-ifdown", "wlan0") == (0, b"", b""), "twice"
 
 

@@ -95,6 +95,17 @@ def test_settings(text, dns):
     assert client_dns(text) == (0, [dns])
 
 
+def test_first_settings_are_written():
+    """What the settings dialog shows on a fresh board: its own first file would be refused."""
+    assert client_dns(None) == (0, [b"auto"])
+    assert read("/etc/wireless.conf") == (
+        b"iface wlan0\naddrtype dhcp\ndns auto\nwifigroup 0\nESSID \nMODE Ad-Hoc\nKEY \nEncryption off\n")
+    assert os.stat("/etc/wireless.conf").st_mode & 0o777 == 0o600
+    settings("mine")
+    client_dns("mine")
+    assert read("/etc/wireless.conf") == b"mine"
+
+
 def test_value_that_is_a_command_is_not_run():
     assert client_dns("iface wlan0\naddrtype $(touch /run/bad)\ndns `x`\n") == (0, [b"`x`"])
     assert not os.path.exists("/run/bad")
@@ -201,7 +212,7 @@ def test_lease_that_never_comes():
     client = clients()[-1]
     assert waiting.wait(120) == 1
     assert not alive(client)
-    assert sorted(os.listdir(STATE)) == ["lock"], "no note stays"
+    assert sorted(os.listdir(STATE)) == ["addressed", "lock"], "no note of a process stays"
 
 
 @pytest.mark.parametrize("words", [(), ("wlan0", "x"), ("",), ("a/b",), ("-a",)])
