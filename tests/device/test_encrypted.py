@@ -184,6 +184,117 @@ def test_what_is_offered(device, key, authentication, index, offered):
     assert app.stdout().count("key_mgmt=") == app.stdout().count("do connect key_index=") == 1
 
 
+# What is done to a hidden stored key, and what the entry shows then.
+TOUCHES = [
+    (["NEW"], "NEW"),
+    (["Home", "NEW"], "NEW"),
+    (["End", "NEW"], "NEW"),
+    (["End", "Left", "Left", "NEW"], "NEW"),
+    (["Home", "Right", "NEW"], "NEW"),
+    (["Home", "shift+Right", "NEW"], "NEW"),
+    (["click", "NEW"], "NEW"),
+    (["ctrl+a", "NEW"], "NEW"),
+    (["End", "ctrl+v"], "PASTED"),
+    (["shift+Insert"], "PASTED"),
+    (["Home", "ctrl+v", "NEW"], "PASTEDNEW"),
+    (["BackSpace"], ""),
+    (["Home", "BackSpace", "NEW"], "NEW"),
+    (["Home", "Delete", "NEW"], "NEW"),
+    (["End", "Left", "Delete"], ""),
+    (["End", "ctrl+BackSpace"], ""),
+    (["ctrl+a", "Delete", "NEW"], "NEW"),
+]
+
+
+def touch(d, dialog, hand):
+    if hand == "click":
+        dialog.click("connect_key")
+    elif hand == "NEW":
+        d.display.type(hand)
+    else:
+        d.display.key(hand)
+
+
+def test_a_hidden_key_is_replaced_whole(device):
+    """Whatever is done to it, no text is ever a mixture of it and what was typed."""
+    d, app = idle(device, HOME, files=preferred(("Upstairs", "home net", 0, 0, "storedkey"),
+                                                ("Attic", "home net", 0, 0, "x" * 127)))
+    # For the clipboard.
+    dialog = key_dialog(app)
+    dialog.type("connect_key", "PASTED")
+    app.key("ctrl+a")
+    app.key("ctrl+c")
+    cancel(dialog)
+    for other in (False, True):
+        for hands, shown in TOUCHES[::3] if other else TOUCHES:
+            dialog = key_dialog(app)
+            assert answers(dialog)[:2] == ("storedkey", False)
+            assert dialog.find("connect_key")["focus"]
+            if other:
+                # Another stored network: the focus stays with the choice, a click takes it back.
+                dialog.choose("GtkComboBox", 1)
+                wait_until(lambda: answers(dialog)[:2] == ("x" * 127, False), "the other key")
+                dialog.click("connect_key")
+                wait_until(lambda: dialog.find("connect_key")["focus"], "the focus on the key")
+            for hand in hands:
+                touch(d, dialog, hand)
+            wait_until(lambda: answers(dialog)[:2] == (shown, True),
+                       lambda: f"{shown} after {hands}; it is {answers(dialog)}")
+            cancel(dialog)
+
+    # A key that is only looked at is sent; a mistyped one is not kept by a second press on Enter.
+    before = d.file(FILE)
+    dialog = key_dialog(app)
+    for hand in ("Home", "Right", "End", "click"):
+        touch(d, dialog, hand)
+    assert answers(dialog)[:2] == ("storedkey", False)
+    d.display.key("ctrl+a")
+    d.display.type("NEW")
+    d.display.key("Return")
+    question = app.dialog(text=OFFER)
+    app.key("Return")
+    app.key("Return")
+    type_answer(app, question, "Attic")
+    for _ in "Attic":
+        app.key("BackSpace")
+    app.key("Return")
+    wait_until(lambda: question.find(type="GtkEntry")["text"] == "", "an empty alias")
+    assert question.exists() and d.file(FILE) == before and d.commands("iwset") == []
+    type_answer(app, question, "Cellar")
+    app.key("Return")
+    wait_commands(d, app)
+    assert d.commands("iwset")[0].argv[6:8] == ["key", "NEW"]
+    assert re.findall(rb"^(?:ALIAS|KEY) (.*)$", d.file(FILE), re.M)[-2:] == [b"Cellar", b"NEW"]
+
+
+def test_no_text_is_cut_in_silence(device):
+    """An entry takes what its field holds, in bytes: what was left out is seen at once."""
+    d, app = idle(device, HOME)
+    dialog = key_dialog(app)
+    dialog.click("connect_key")
+    d.display.type("\u00fc" * 70)
+    d.display.type("ab")
+    wait_until(lambda: answers(dialog)[0] == "\u00fc" * 63 + "a", lambda: answers(dialog)[0])
+    # Pasted too, and what fits of it is whole characters.
+    app.key("ctrl+a")
+    app.key("ctrl+c")
+    app.key("Left")
+    app.key("Delete")
+    app.key("End")
+    app.key("BackSpace")
+    wait_until(lambda: answers(dialog)[0] == "\u00fc" * 62, lambda: answers(dialog)[0])
+    app.key("ctrl+v")
+    wait_until(lambda: answers(dialog)[0] == "\u00fc" * 63, lambda: answers(dialog)[0])
+    dialog.press("gtk-ok")
+    question = app.dialog(text=OFFER)
+    d.display.type("\u7f51" * 43)
+    wait_until(lambda: question.find(type="GtkEntry")["text"] == "\u7f51" * 42, "a full alias")
+    app.key("Return")
+    wait_commands(d, app)
+    assert d.file("/tmp/key_tmp") == ("\u00fc" * 63).encode() + b"\n"
+    assert "ALIAS {}\n".format("\u7f51" * 42).encode() in d.file(FILE)
+
+
 def offer(app, key, authentication=None, index=None):
     answer_key(app, key, authentication=authentication, index=index, offer=None)
     return app.dialog(text=OFFER)

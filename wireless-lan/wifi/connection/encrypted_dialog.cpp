@@ -7,6 +7,7 @@
 #include <glib/gi18n.h>
 
 #include "base/dialogs.h"
+#include "base/entries.h"
 #include "base/registry.h"
 #include "base/state.h"
 #include "preferred/store.h"
@@ -174,17 +175,41 @@ void cb_change_network(GtkWidget *combobox, gpointer)
     GtkWidget *entry = find_widget(ENTRY_KEY);
 
     if (entry != nullptr) {
-        g_autofree gchar *shown = displayable(record->userkey);
-
+        // Visible while it is filled: that is no touch of a hidden key.
+        gtk_entry_set_visibility(GTK_ENTRY(entry), TRUE);
+        fill_text_entry(entry, record->userkey);
         gtk_entry_set_visibility(GTK_ENTRY(entry), FALSE);
-        gtk_entry_set_text(GTK_ENTRY(entry), shown);
-        g_free(sel_key);
+        wipe_text(&sel_key);
         sel_key = g_strdup(record->userkey);
     }
     // The record takes over what is shown, not the other way round: the combos show the last
     // network of the name, and a changed answer is recognised against these two.
     take_active(AUTHENTICATION_KEY, &record->key_mgmt, &key_mgmt);
     take_active(KEY_INDEX_KEY, &record->key_index, &key_index);
+}
+
+static void remove_hidden_key(GtkEditable *editable)
+{
+    gtk_entry_set_visibility(GTK_ENTRY(editable), TRUE);
+    gtk_editable_delete_text(editable, 0, -1);
+}
+
+// "insert-text" and "delete-text" of the key entry: a hidden key that is touched in any way goes as
+// a whole, so that no text is ever a mixture of it and what was typed.
+static void cb_key_inserted(GtkEditable *editable, const gchar *, gint, gint *position, gpointer)
+{
+    if (gtk_entry_get_visibility(GTK_ENTRY(editable)))
+        return;
+    remove_hidden_key(editable);
+    *position = 0;
+}
+
+static void cb_key_deleted(GtkEditable *editable, gint, gint, gpointer)
+{
+    if (gtk_entry_get_visibility(GTK_ENTRY(editable)))
+        return;
+    remove_hidden_key(editable);
+    g_signal_stop_emission_by_name(editable, "delete-text");
 }
 
 gboolean connect_key_cb(GdkEventKey *)
@@ -211,7 +236,7 @@ static gchar *entered_key()
     if (entry == nullptr)
         return nullptr;
     if (sel_key != nullptr && !gtk_entry_get_visibility(entry)) {
-        g_autofree gchar *shown = displayable(sel_key);
+        WIPED gchar *shown = displayable(sel_key);
 
         if (strcmp(gtk_entry_get_text(entry), shown) == 0)
             return g_strdup(sel_key);
@@ -327,6 +352,20 @@ static void cb_key_entered(GtkEntry *, gpointer dialog)
     gtk_dialog_response(GTK_DIALOG(dialog), GTK_RESPONSE_OK);
 }
 
+static GtkWidget *create_key_entry(GtkWidget *dialog, gboolean hidden)
+{
+    GtkWidget *entry = gtk_entry_new();
+
+    register_named_widget(entry, ENTRY_KEY);
+    gtk_entry_set_visibility(GTK_ENTRY(entry), !hidden);
+    g_signal_connect(entry, "insert-text", G_CALLBACK(cb_key_inserted), nullptr);
+    g_signal_connect(entry, "delete-text", G_CALLBACK(cb_key_deleted), nullptr);
+    limit_text_entry(entry);
+    g_signal_connect(entry, "backspace", G_CALLBACK(connect_key_cb), nullptr);
+    g_signal_connect(entry, "activate", G_CALLBACK(cb_key_entered), dialog);
+    return entry;
+}
+
 GtkWidget *create_encrypted_dialog(int *match_count)
 {
     const WIFI_CELL *cell = scanned_cell(connect_index);
@@ -338,7 +377,7 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
     GtkWidget *authentication = create_Authentication_ComboBox();
     GtkWidget *preferred = create_ComboBox(match_count);
-    GtkWidget *entry = gtk_entry_new();
+    GtkWidget *entry = create_key_entry(dialog, *match_count > 0);
     GtkWidget *index = create_Key_Index_ComboBox();
 
     debug_line("create_ComboBox match_count=%d", *match_count);
@@ -349,11 +388,6 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     pack_combo(attach_frame(table, _("Preferred Network"), 2), preferred);
     pack_key(attach_frame(table, _("Key"), 3), entry, index);
 
-    register_named_widget(entry, ENTRY_KEY);
-    gtk_entry_set_visibility(GTK_ENTRY(entry), *match_count == 0);
-    g_signal_connect(entry, "backspace", G_CALLBACK(connect_key_cb), nullptr);
-    g_signal_connect(entry, "activate", G_CALLBACK(cb_key_entered), dialog);
-    gtk_widget_grab_focus(entry);
     if (authentication != invalid_widget())
         register_named_widget(authentication, AUTHENTICATION_KEY);
     if (index != invalid_widget())
@@ -362,5 +396,7 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     // This "changed" fills the first network in, so everything else stands by now.
     if (preferred != invalid_widget() && *match_count > 0)
         gtk_combo_box_set_active(GTK_COMBO_BOX(preferred), 0);
+    // Last, since the focus selects the whole key: what is typed at once replaces it.
+    gtk_widget_grab_focus(entry);
     return dialog;
 }

@@ -106,8 +106,8 @@ static gboolean ask_name(WIFI_CELL *chosen)
 {
     // The question stands on a window of its own, which is never shown.
     GtkWidget *parent = gtk_window_new(GTK_WINDOW_TOPLEVEL);
-    g_autofree gchar *name =
-        ask_text(parent, _("The essid is empty,Please input the Essid: "), _("Essid:"));
+    g_autofree gchar *name = ask_text(parent, _("The essid is empty,Please input the Essid: "),
+                                      _("Essid:"), ENTER_ANSWERS);
 
     gtk_widget_destroy(parent);
 

@@ -6,15 +6,11 @@
 #include <glib/gi18n.h>
 
 #include "base/dialogs.h"
+#include "base/entries.h"
 #include "base/registry.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/text.h"
-
-// The longest text that a record keeps.
-constexpr gint MAX_TEXT = sizeof(WIFI_CELL::alias) - 1;
-static_assert(sizeof(WIFI_CELL::alias) == sizeof(WIFI_CELL::essid) &&
-              sizeof(WIFI_CELL::alias) == sizeof(WIFI_CELL::userkey));
 
 const network_form add_form = {
     N_("Add WiFi Network"),
@@ -74,9 +70,8 @@ static void attach_row(GtkWidget *table, guint row, const char *text, GtkWidget 
 
 static GtkWidget *create_entry(const char *key)
 {
-    GtkWidget *entry = gtk_entry_new();
+    GtkWidget *entry = create_text_entry();
 
-    gtk_entry_set_max_length(GTK_ENTRY(entry), MAX_TEXT);
     register_named_widget(entry, key);
     return entry;
 }
@@ -184,9 +179,7 @@ void connect_network_form(const network_form &form)
 
 void set_form_text(const char *key, const gchar *text)
 {
-    g_autofree gchar *shown = displayable(text);
-
-    gtk_entry_set_text(GTK_ENTRY(find_widget(key)), shown);
+    fill_text_entry(find_widget(key), text);
 }
 
 void choose_form_radio(const char *key)

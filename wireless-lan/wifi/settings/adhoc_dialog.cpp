@@ -6,11 +6,12 @@
 #include <glib/gi18n.h>
 
 #include "base/dialogs.h"
+#include "base/entries.h"
 #include "wifi.h"
 #include "wifi_info/text.h"
 
 // Only the ESSID is shown. The other widgets are never placed in the window: they carry the
-// network's encryption and key from one opening to the next.
+// network's encryption and key from the record to OK, which stores them again.
 struct group_form {
     GtkWidget *essid;
     GtkWidget *key;
@@ -32,11 +33,10 @@ void cb_active_wifi_group(GtkToggleButton *togglebutton, gpointer user_data)
 
 static GtkWidget *create_entry(const char *text)
 {
-    GtkWidget *entry = gtk_entry_new();
-    g_autofree gchar *shown = displayable(text);
+    GtkWidget *entry = create_text_entry();
 
     gtk_editable_set_editable(GTK_EDITABLE(entry), TRUE);
-    gtk_entry_set_text(GTK_ENTRY(entry), shown);
+    fill_text_entry(entry, text);
     return entry;
 }
 
