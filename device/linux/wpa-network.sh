@@ -15,7 +15,8 @@ hex() {
 }
 
 # For awk: unescaped(DIGITS), the bytes of a name from the hexadecimal digits of its text. \xNN,
-# which the list shows for a byte that cannot be shown, stands for that byte.
+# which the list shows for a byte that cannot be shown, stands for that byte. So do the digits after
+# \X for 32 bytes, where that text would be longer than the program keeps; no name has 66 bytes.
 unescape='
 function value_of(code) {
     if (code ~ /^3[0-9]$/)
@@ -25,6 +26,12 @@ function value_of(code) {
     return ""
 }
 function unescaped(text,    i, high, low, result) {
+    result = ""
+    if (substr(text, 1, 4) == "5c58" && length(text) == 132)
+        for (i = 5; i < 132; i += 2)
+            result = result value_of(substr(text, i, 2))
+    if (length(result) == 64)
+        return result
     result = ""
     for (i = 1; i < length(text); i += 2) {
         high = value_of(substr(text, i + 4, 2))

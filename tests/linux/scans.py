@@ -21,6 +21,7 @@ HOSTILE = [
     b"sixteen                 b", b" ", b"        ", b"\\x41", b"a\\x41", b"\\x41b", b"\\\\x41",
     b"\\x4", b"\\x5Cx41", b"\xff\xfe", b"\xc3", b"\xc0\xaf", b"\xed\xa0\x80", b"\xf4\x90\x80\x80",
     b"\xe2\x80\xae rtl", b"\xc2\x85", b"a\x00b", b"\x00a", b"x" * 32, b"\xff" * 31,
+    b"\xff" * 32, bytes(range(224, 256)), b"\\X" + b"41" * 15, b"\\X4",
     b"\xe2\x98\x95" * 10, b"off", b"any", b"wpa", b"essid", b"[TEMP-DISABLED]",
     b"wpa_state=COMPLETED",
 ]

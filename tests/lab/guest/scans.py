@@ -48,10 +48,10 @@ NAMES = [
     b"cafe", b"home net", b"a\"b$(id)", b"\\", b"end\\", b"\\x41", b"a\\x41", b"\"", b"'", b"`id`",
     b"$HOME", b"%s%n", b"-n", b" blank at ends ", b"eight        blanks", b" ",
     b"Cell 99 - Address: x", b"ESSID:\"x\"", b"BSS 02:00:00:00:00:99(on wlan0)", b"SSID: x",
-    b"\tfreq: 5180", b"line\nend", b"\r\n", "Café ☕".encode(), "Zürich Москва".encode(), "無線ネット".encode(),
-    b"\xf0\x9f\x98\x80", b"\xff\xfe", b"\xc3", b"\xe2\x80\xae rtl", b"\x7f\x01", b"x" * 32, b"\xff" * 32,
-    bytes(range(32)), bytes(range(224, 256)), "☕".encode() * 10, b"a\0b", b"\0a",
-    b"<invalid: 33 bytes",
+    b"\tfreq: 5180", b"line\nend", b"\r\n", "Café ☕".encode(), "Zürich Москва".encode(),
+    "無線ネット".encode(), b"\xf0\x9f\x98\x80", b"\xff\xfe", b"\xc3", b"\xe2\x80\xae rtl", b"\x7f\x01",
+    b"x" * 32, b"\xff" * 32, bytes(range(32)), bytes(range(224, 256)), "☕".encode() * 10, b"a\0b",
+    b"\0a", b"<invalid: 33 bytes",
 ]
 
 
