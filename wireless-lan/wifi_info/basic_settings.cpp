@@ -48,7 +48,7 @@ gboolean save_basic_setting_to_file(const gchar *file)
 {
     const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
 
-    if (!iface) {
+    if (iface == nullptr) {
         debug_line("no interface, %s is not written", file);
         return FALSE;
     }
@@ -71,7 +71,7 @@ gboolean save_basic_setting_to_file(const gchar *file)
 // Reads the next line and trims it. Behind the last line the former one stays, to be read again.
 static gboolean next_line(FILE *stream, char *line)
 {
-    if (!fgets(line, LINE_SIZE, stream))
+    if (fgets(line, LINE_SIZE, stream) == nullptr)
         return FALSE;
     g_strstrip(line);
     return TRUE;
@@ -83,7 +83,7 @@ static gboolean get_piece(const char *line, int index, char *value)
 {
     for (; index > 0; index--) {
         line = strchr(line, ' ');
-        if (!line)
+        if (line == nullptr)
             return FALSE;
         line++;
     }
@@ -115,7 +115,7 @@ static gboolean find_stanza(FILE *stream, char *line)
         g_autofree gchar *shown = printable(name);
 
         debug_line("ifname:%s", shown);
-        if (iface && g_str_equal(name, iface->name))
+        if (iface != nullptr && g_str_equal(name, iface->name))
             return TRUE;
     }
     return FALSE;
@@ -169,7 +169,7 @@ void read_basic_settings(FILE *stream)
 {
     WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
 
-    if (iface) {
+    if (iface != nullptr) {
         iface->wifi_group_enable = FALSE;
         iface->wifi_group = {};
     }
@@ -219,7 +219,7 @@ gboolean get_basic_setting_from_file(const gchar *file)
 {
     FILE *stream = open_settings(file);
 
-    if (!stream)
+    if (stream == nullptr)
         return errno == ENOENT;
     read_basic_settings(stream);
     return !ferror(stream);
@@ -229,7 +229,7 @@ gboolean get_basic_setting_from_file_Advanced(const gchar *file)
 {
     FILE *stream = open_settings(file);
 
-    if (!stream)
+    if (stream == nullptr)
         return errno == ENOENT;
     read_basic_settings_advanced(stream);
     return !ferror(stream);
@@ -246,23 +246,23 @@ gchar *get_file_var(const gchar *file, const gchar *var)
 
     g_auto(GStrv) lines = g_strsplit(content, "\n", 2048);
 
-    for (gchar **line = lines; *line; line++) {
+    for (gchar **line = lines; *line != nullptr; line++) {
         g_strchomp(*line);
-        if (**line == '#' || !strstr(*line, var))
+        if (**line == '#' || strstr(*line, var) == nullptr)
             continue;
 
         const gchar *separator = strrchr(*line, '=');
 
-        if (!separator)
+        if (separator == nullptr)
             separator = strrchr(*line, ' ');
-        return separator ? g_strdup(separator + 1) : nullptr;
+        return separator != nullptr ? g_strdup(separator + 1) : nullptr;
     }
     return g_strdup("");
 }
 
 void get_paramval(gchar *source, gchar *keyword, gchar *ret)
 {
-    if (!source || !keyword || !ret) {
+    if (source == nullptr || keyword == nullptr || ret == nullptr) {
         log_critical("get_paramval", "source!=NULL&&keyword!=NULL&&ret!=NULL");
         return;
     }

@@ -11,7 +11,7 @@ static void name_interface(int slot, const char *line)
 {
     WIFI_INTERFACE *&iface = my_wifi->wifi_interface[slot];
 
-    if (!iface)
+    if (iface == nullptr)
         iface = g_new0(WIFI_INTERFACE, 1);
 
     g_autofree gchar *name = g_strndup(line, strcspn(line, ":"));
@@ -26,13 +26,13 @@ void read_interfaces(FILE *stream)
     my_wifi->interface_index = 0;
     my_wifi->interface_count = -1;
     do {
-        if (!fgets(line, sizeof line, stream))
+        if (fgets(line, sizeof line, stream) == nullptr)
             return;
     } while (!g_str_has_prefix(line, " face"));
 
     int count = 0;
 
-    while (fgets(line, sizeof line, stream)) {
+    while (fgets(line, sizeof line, stream) != nullptr) {
         if (count < MAX_INTERFACES)
             name_interface(count++, line);
     }
@@ -46,7 +46,7 @@ gboolean get_interface()
 {
     FILE *pipe = popen("cat /proc/net/wireless", "r");
 
-    if (!pipe) {
+    if (pipe == nullptr) {
         perror("pipe");
         return FALSE;
     }

@@ -49,7 +49,7 @@ static void copy_rest(char *field, gsize size, char *line)
 {
     gchar *blank = strchr(line, ' ');
 
-    copy_field(field, size, blank ? g_strstrip(blank) : nullptr);
+    copy_field(field, size, blank != nullptr ? g_strstrip(blank) : nullptr);
 }
 
 static t_encmode read_encryption(const char *line)
@@ -106,7 +106,7 @@ gboolean read_preferred_networks(FILE *stream)
     gboolean left_out = FALSE;
     int count = 0;
 
-    while (fgets(line, sizeof line, stream)) {
+    while (fgets(line, sizeof line, stream) != nullptr) {
         if (!g_str_has_prefix(line, "USERCELL"))
             continue;
 
@@ -120,7 +120,7 @@ gboolean read_preferred_networks(FILE *stream)
 
         WIFI_CELL *&cell = my_wifi->user_wifi_cell[count++];
 
-        if (!cell)
+        if (cell == nullptr)
             cell = g_new(WIFI_CELL, 1);
         *cell = record;
     }
@@ -134,7 +134,7 @@ gboolean get_preferred_network_setting_from_file(const gchar *file)
 {
     FILE *stream = open_text(file);
 
-    if (!stream)
+    if (stream == nullptr)
         return errno == ENOENT;
 
     gboolean whole = read_preferred_networks(stream);

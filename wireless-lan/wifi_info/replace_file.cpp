@@ -19,7 +19,7 @@ static gchar *resolve_links(const char *path)
     for (int links = 0; links < 40; links++) {
         g_autofree gchar *target = g_file_read_link(name, nullptr);
 
-        if (!target)
+        if (target == nullptr)
             break;
 
         g_autofree gchar *link = name;
@@ -62,9 +62,9 @@ static void sync_folder(const char *target)
 // of owner can clear bits of the mode, so it comes first.
 static int fill(int fd, const struct stat *old, const char *content, gsize length)
 {
-    if (old && fchown(fd, old->st_uid, old->st_gid) != 0)
+    if (old != nullptr && fchown(fd, old->st_uid, old->st_gid) != 0)
         return errno;
-    if (old && fchmod(fd, old->st_mode & 07777) != 0)
+    if (old != nullptr && fchmod(fd, old->st_mode & 07777) != 0)
         return errno;
 
     int reason = write_all(fd, content, length);

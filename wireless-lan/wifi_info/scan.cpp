@@ -20,7 +20,7 @@ static gchar *first_pieces(gchar *src, const gchar *target, const char *separato
 {
     gchar *keyword = strstr(src, target);
 
-    if (!keyword)
+    if (keyword == nullptr)
         return nullptr;
 
     gchar *first = g_strstrip(keyword + strlen(target));
@@ -30,19 +30,20 @@ static gchar *first_pieces(gchar *src, const gchar *target, const char *separato
 
     const gchar *first_end = strstr(first, separator);
 
-    if (!first_end)
+    if (first_end == nullptr)
         return g_strdup(first);
 
     gchar *piece = g_strndup(first, static_cast<gsize>(first_end - first));
 
-    if (!unit)
+    if (unit == 0)
         return piece;
 
     const gchar *second = first_end + strlen(separator);
     const gchar *second_end = strstr(second, separator);
     g_autofree gchar *head = piece;
-    g_autofree gchar *tail =
-        second_end ? g_strndup(second, static_cast<gsize>(second_end - second)) : g_strdup(second);
+    g_autofree gchar *tail = second_end != nullptr
+                                 ? g_strndup(second, static_cast<gsize>(second_end - second))
+                                 : g_strdup(second);
 
     return g_strconcat(head, " ", tail, nullptr);
 }
@@ -97,13 +98,13 @@ static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
 
         g_autofree gchar *value = VALUES[i].extract(line, VALUES[i].keyword, 0);
 
-        if (!value)
+        if (value == nullptr)
             continue;
         keywords_used[i] = TRUE;
         if (VALUES[i].extract == get_essid_value)
             unquote(value);
         copy_field(reinterpret_cast<char *>(cell) + VALUES[i].offset, VALUES[i].size, value);
-        if (VALUES[i].label) {
+        if (VALUES[i].label != nullptr) {
             g_autofree gchar *shown = printable(value);
 
             debug_line("%s:%s", VALUES[i].label, shown);
@@ -124,7 +125,7 @@ static gboolean take_authentication(char *line, WIFI_CELL *cell)
 
     g_autofree gchar *word = get_string_value(line, "Authentication:", 0);
 
-    if (!word)
+    if (word == nullptr)
         return FALSE;
     cell->key_mgmt = g_str_equal(word, "WPA");
     return TRUE;
@@ -144,7 +145,7 @@ static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
 
         if (bit_rates)
             return;
-    } while (fgets(line, LINE_SIZE, stream));
+    } while (fgets(line, LINE_SIZE, stream) != nullptr);
 }
 
 static void release_cells()
@@ -161,8 +162,8 @@ void read_cells(FILE *stream)
     const char *disconnected = gettext("Disconnect");
     char line[LINE_SIZE] = "";
 
-    while (fgets(line, sizeof line, stream)) {
-        if (!strstr(line, "Cell"))
+    while (fgets(line, sizeof line, stream) != nullptr) {
+        if (strstr(line, "Cell") == nullptr)
             continue;
         debug_line("FIND CELL[%d]", my_wifi->cell_count);
 
@@ -182,7 +183,7 @@ void read_cells(FILE *stream)
 void get_cell(WIFI_INTERFACE *iface)
 {
     debug_line("get cell start...");
-    if (!iface || !interface_usable(iface->name, "the scan")) {
+    if (iface == nullptr || !interface_usable(iface->name, "the scan")) {
         release_cells();
         return;
     }
@@ -191,7 +192,7 @@ void get_cell(WIFI_INTERFACE *iface)
     g_autofree gchar *command = g_strdup_printf("iwlist %s scan", iface->name);
     FILE *pipe = popen(command, "r");
 
-    if (!pipe) {
+    if (pipe == nullptr) {
         perror("pipe");
         return;
     }

@@ -12,7 +12,7 @@ gchar *shell_escape(const char *text)
     GString *escaped = g_string_sized_new(2 * strlen(text) + 1); // never moved, it may be a key
 
     for (; *text; text++) {
-        if (strchr("\"\\$`", *text))
+        if (strchr("\"\\$`", *text) != nullptr)
             g_string_append_c(escaped, '\\');
         g_string_append_c(escaped, *text);
     }
@@ -24,7 +24,7 @@ gchar *echo_command(const char *text, const char *path)
     WIPED gchar *escaped = shell_escape(text);
 
     // An echo may take "-n" for an option, and that of dash turns "\t" into a tabulator.
-    if (text[0] == '-' || strchr(text, '\\'))
+    if (text[0] == '-' || strchr(text, '\\') != nullptr)
         return g_strdup_printf("printf '%%s\\n' \"%s\" >%s", escaped, path);
     return g_strdup_printf("echo \"%s\" >%s", escaped, path);
 }
@@ -48,7 +48,7 @@ static gboolean is_plain_name(const char *name)
         guchar byte = static_cast<guchar>(*name);
 
         if (byte <= ' ' || byte == 0x7F || byte == 0xA0 ||
-            strchr("/:|&;<>()$`\\\"'*?[]#~=!{}^", byte))
+            strchr("/:|&;<>()$`\\\"'*?[]#~=!{}^", byte) != nullptr)
             return FALSE;
     }
     return TRUE;

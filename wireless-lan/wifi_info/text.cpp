@@ -23,7 +23,7 @@ static gsize whole_characters(const char *text, gsize length)
 
 void copy_field(char *field, gsize size, const char *text)
 {
-    gsize length = text ? strnlen(text, size) : 0;
+    gsize length = text != nullptr ? strnlen(text, size) : 0;
 
     if (length == size)
         length = whole_characters(text, size - 1);
@@ -48,12 +48,12 @@ FILE *open_text(const gchar *file)
     struct stat status;
     int reason = errno;
 
-    if (stream && fstat(fileno(stream), &status) == 0 && S_ISDIR(status.st_mode)) {
+    if (stream != nullptr && fstat(fileno(stream), &status) == 0 && S_ISDIR(status.st_mode)) {
         fclose(stream);
         stream = nullptr;
         reason = EISDIR;
     }
-    if (!stream)
+    if (stream == nullptr)
         fprintf(stderr, "Could not access file: %s\n", file);
     errno = reason;
     return stream;
