@@ -95,7 +95,9 @@ typedef struct _MY_WIFI MY_WIFI;
 // records fix order and width.
 static_assert(std::is_trivial<MY_WIFI>::value && std::is_standard_layout<MY_WIFI>::value);
 static_assert(std::is_trivial<WIFI_INTERFACE>::value && std::is_trivial<WIFI_CELL>::value);
-static_assert(sizeof(iw_statics) == 16 && sizeof(gboolean) == 4);
+static_assert(sizeof(t_wifimode) == 4 && sizeof(gboolean) == 4);
+static_assert(offsetof(iw_statics, quality) == 4 && offsetof(iw_statics, level) == 8);
+static_assert(offsetof(iw_statics, noise) == 12 && sizeof(iw_statics) == 16);
 static_assert(offsetof(WIFI_CELL, essid) == 32 && offsetof(WIFI_CELL, mode) == 160);
 static_assert(offsetof(WIFI_CELL, encmode) == 176 && offsetof(WIFI_CELL, channel) == 180);
 static_assert(offsetof(WIFI_CELL, key) == 220 && offsetof(WIFI_CELL, userkey) == 224);
@@ -117,6 +119,16 @@ static_assert(offsetof(WIFI_INTERFACE, UP) == 476 && offsetof(WIFI_INTERFACE, RU
 static_assert(offsetof(WIFI_INTERFACE, auto_dns) == 484 && offsetof(WIFI_INTERFACE, stats) == 488);
 static_assert(offsetof(WIFI_INTERFACE, wifi_group_enable) == 504);
 static_assert(offsetof(WIFI_INTERFACE, wifi_group) == 508 && sizeof(WIFI_INTERFACE) == 1312);
+static_assert(offsetof(MY_WIFI, interface_count) == 4 && offsetof(MY_WIFI, wifi_interface) == 8);
+static_assert(offsetof(MY_WIFI, cell_index) == 8 + 16 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, cell_count) == 12 + 16 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, user_cell_count) == 16 + 16 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, user_cell_index) == 20 + 16 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, wifi_cell) == 24 + 16 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, user_wifi_cell) == 24 + 144 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, wifi_view) == 24 + 208 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, wifi_combo) == 24 + 209 * sizeof(void *));
+static_assert(offsetof(MY_WIFI, cell_type) == 24 + 210 * sizeof(void *));
 
 // Defined here, once for every program that includes the header, so that wifi_info links alone.
 inline MY_WIFI *my_wifi = nullptr;      // created by start-up, never freed

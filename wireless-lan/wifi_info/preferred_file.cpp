@@ -68,36 +68,26 @@ static guint32 read_number(const char *line)
     return static_cast<guint32>(decimal(word));
 }
 
-// Reads the seven lines behind a header by their position alone. What a cut file lacks stays zero.
+// Reads the next line into `line`; after the last one it is empty.
+static char *next_line(FILE *stream, char *line)
+{
+    if (fgets(line, LINE_SIZE, stream) == nullptr)
+        line[0] = '\0';
+    return line;
+}
+
+// Reads the seven lines after a header by their position alone. What a cut file lacks stays zero.
 static void read_record(FILE *stream, WIFI_CELL *cell)
 {
-    char line[LINE_SIZE] = "";
+    char line[LINE_SIZE];
 
-    for (int position = 0; position < 7 && fgets(line, sizeof line, stream); position++) {
-        switch (position) {
-        case 0:
-            copy_rest(cell->alias, sizeof cell->alias, line);
-            break;
-        case 1:
-            copy_rest(cell->essid, sizeof cell->essid, line);
-            break;
-        case 2:
-            copy_second_word(cell->mode, sizeof cell->mode, line);
-            break;
-        case 3:
-            cell->key_mgmt = read_number(line);
-            break;
-        case 4:
-            cell->key_index = read_number(line);
-            break;
-        case 5:
-            cell->encmode = read_encryption(line);
-            break;
-        case 6:
-            copy_second_word(cell->userkey, sizeof cell->userkey, line);
-            break;
-        }
-    }
+    copy_rest(cell->alias, sizeof cell->alias, next_line(stream, line));
+    copy_rest(cell->essid, sizeof cell->essid, next_line(stream, line));
+    copy_second_word(cell->mode, sizeof cell->mode, next_line(stream, line));
+    cell->key_mgmt = read_number(next_line(stream, line));
+    cell->key_index = read_number(next_line(stream, line));
+    cell->encmode = read_encryption(next_line(stream, line));
+    copy_second_word(cell->userkey, sizeof cell->userkey, next_line(stream, line));
 }
 
 gboolean read_preferred_networks(FILE *stream)
