@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Takes the measurements on the simulated device and prints the table. Started by ./run.
 
     measure.py BUILD [STARTS [REFRESHES [ONLY...]]]
@@ -149,11 +150,11 @@ class Start:
 
     def activity(self):
         """Voluntary and involuntary context switches, and CPU time in ms."""
-        folder = PROC / str(self.pid)
-        status = (folder / "status").read_text()
+        directory = PROC / str(self.pid)
+        status = (directory / "status").read_text()
         switches = [int(re.search(rf"^{kind}_ctxt_switches:\s+(\d+)", status, re.M)[1])
                     for kind in ("voluntary", "nonvoluntary")]
-        return (*switches, int((folder / "schedstat").read_text().split()[0]) / 1e6)
+        return (*switches, int((directory / "schedstat").read_text().split()[0]) / 1e6)
 
 
 def without(area, hole):

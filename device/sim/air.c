@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Preloaded into the program: answers SIOCGIWAP for interfaces that exist, as a wireless driver
 // does, and passes every other request on untouched.
 //

@@ -1,6 +1,7 @@
+// SPDX-License-Identifier: MIT
 // Preloaded into the program when a test rules its time: the clocks, and everything that waits by
 // them, follow a page that the test writes. Virtual time passes RATE times as fast as real time;
-// at rate 0 it stands still until the test moves it.
+// at rate 0 it does not move until the test moves it.
 #define _GNU_SOURCE
 #include <fcntl.h>
 #include <poll.h>
@@ -29,7 +30,7 @@ struct page {
 static const volatile struct page *page;
 
 // How far these clocks are ahead of the monotonic one. Measured once: a distance that is measured
-// anew at every look is a little different each time, and a clock that stands still would tremble.
+// anew at every look is a little different each time, and a clock at rest would tremble.
 static int64_t real_ahead, boot_ahead;
 
 // The system call itself: a name looked up in the next library may lead back here.

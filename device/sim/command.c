@@ -1,8 +1,9 @@
+// SPDX-License-Identifier: MIT
 // Every command of the simulated device: iwset, lnk-ifup, lnk-ifdown, ifconfig, iwlist, cat.
 //
 // One program under all the names. It writes down how it was called, waits, runs the scenario's
-// hook, prints what the state folder holds for it, and leaves with the exit status that stands
-// there. Files of the state folder, each of them optional and read anew on every call:
+// hook, prints what the state directory holds for it, and ends with the exit status that is
+// there. Files of the state directory, each of them optional and read anew on every call:
 //
 //   NAME.delay   seconds to wait first       hooks/NAME   program to run next, same arguments
 //   NAME.stdout  text for standard output    NAME.stderr  text for standard error
@@ -10,7 +11,7 @@
 //   wireless     what "cat /proc/net/wireless" prints
 //
 // The log is one JSON object a line, each written at once: "start" with the arguments, "end" with
-// the status and the parent at that time. Bytes stand as the characters U+0000 to U+00FF.
+// the status and the parent at that time. Bytes are written as the characters U+0000 to U+00FF.
 #define _GNU_SOURCE
 #include <errno.h>
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // First process of the simulated device: starts one program, takes in every process that lost its
 // parent, and leaves with the program's exit status. The rest of the namespace ends with it.
 #include <errno.h>

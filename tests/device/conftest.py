@@ -17,10 +17,10 @@ def pytest_runtest_makereport(item, call):
     outcome = yield
     report = outcome.get_result()
     if report.failed:
-        folder = f"{TOP}/build-device/failed/" + re.sub(r"[^\w.-]+", "_", item.nodeid)
+        directory = f"{TOP}/build-device/failed/" + re.sub(r"[^\w.-]+", "_", item.nodeid)
         for number, device in enumerate(OPEN):
-            device.keep(folder + (f".{number}" if number else ""))
-            report.sections.append(("device", f"screenshot and logs in {folder}"))
+            device.keep(directory + (f".{number}" if number else ""))
+            report.sections.append(("device", f"screenshot and logs in {directory}"))
 
 
 def devices():

@@ -1,4 +1,5 @@
-"""Steps of a connect that several tests take. Time stands still but for what a test lets pass."""
+# SPDX-License-Identifier: MIT
+"""Steps of a connect that several tests take. Time passes only when a test lets it."""
 
 from harness import wait_until
 from preferred import FILE, Network, file_of
@@ -42,7 +43,7 @@ def settle(app):
 
 
 def pass_time(d, app, milliseconds):
-    """Moves the time on and lets what is due happen. The question behind it wakes the main loop,
+    """Moves the time on and lets what is due happen. The question after it wakes the main loop,
     which may have been on its way into a wait that it measured before the time moved."""
     settle(app)
     d.clock.advance(milliseconds)
@@ -55,7 +56,7 @@ def connect(app, row):
 
 
 def wait_commands(d, app, count=1):
-    """Lets the 100 ms behind a press pass, until iwset has run and the poller is under way."""
+    """Lets the 100 ms after a press pass, until iwset has run and the poller is under way."""
     app.wait_title(CONNECTING)
     pass_time(d, app, 100)
     command = d.wait_command("iwset", count)
@@ -64,7 +65,7 @@ def wait_commands(d, app, count=1):
 
 
 def answer_key(app, key, authentication=None, index=None, offer="gtk-no"):
-    """Fills the key dialog in and answers the offer behind it (None: there is none)."""
+    """Fills the key dialog in and answers the offer after it (None: there is none)."""
     dialog = app.dialog("Encrypted Network")
     if key:
         dialog.type("connect_key", key)

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Preferred networks in the tests: the layout of their file, written without the program, and
 the way to their dialogs."""
 
@@ -62,7 +63,7 @@ def open_list(app):
     last = []
 
     def settled():
-        # In its place: a row is clicked by where it stands.
+        # In its place: a row is clicked by its place.
         tree = dialog.tree()
         steady = tree["active"] and last == [tree.find(FRONT)["rect"]]
         last[:] = [tree.find(FRONT)["rect"]]

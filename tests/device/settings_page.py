@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """What the tests of the settings share: the file, the dialog and the hands on it."""
 
 from harness import wait_until

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Switching the built-in module on: the checking window, the wait, the second look."""
 
 import re

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Connecting and disconnecting: what the device is told, what the user sees."""
 
 import os
@@ -75,8 +76,11 @@ def test_every_kind_of_network(device):
          b"bare\n", b"off\n", key="")
 
 
-def test_a_whole_connect_and_back(device):
-    d, app = idle(device, "first", ("home net", "on"))
+TWO = ("first", ("home net", "on"))
+
+
+def test_a_connect_is_told_and_sent_after_a_moment(device):
+    d, app = idle(device, *TWO)
     d.address("10.0.0.9")
     refresh(d, app)
     d.wait_states(5, 5)
@@ -113,15 +117,26 @@ def test_a_whole_connect_and_back(device):
     assert ("WIRELESS-LAN-DEBUG: essid to set:home net\n"
             "WIRELESS-LAN-DEBUG: interface:wlan0\n") in app.stderr()
 
-    # An access point: the address script starts, nobody's child.
+
+def associated(device):
+    """A device and the program on it, just told of the access point of "first"."""
+    d, app = idle(device, *TWO)
     d.command("lnk-ifup", hook="until [ -e /device/state/go ]; do :; done")
-    d.associate(address_of(1))
+    connect(app, 0)
+    wait_commands(d, app)
+    d.associate(address_of(0))
     poll_link(d, app)
+    return d, app
+
+
+def test_an_access_point_starts_the_address_script(device):
+    d, app = associated(device)
     assert settle(app) == ACQUIRING
-    app.wait_state(1, ACQUIRING)
-    d.wait_states(5, 5, 2, 3)
+    app.wait_state(0, ACQUIRING)
+    d.wait_states(5, 2, 3)
     for name in LOCKED:
         assert not app.sensitive(name)
+    # Nobody's child.
     d.wait_command("lnk-ifup", ended=False)
     d.put("go", "")
     script = d.wait_command("lnk-ifup")
@@ -134,13 +149,18 @@ def test_a_whole_connect_and_back(device):
     first, _, second = wait.partition(",exPID=")
     assert first == second and int(first) > 0
 
-    # An address.
+
+
+def test_an_address_ends_the_chain(device):
+    d, app = associated(device)
+    d.put("go", "")
+    d.wait_command("lnk-ifup")
     d.address("192.168.7.23")
     poll_address(d, app)
-    app.wait_state(1, connected("192.168.7.23"))
+    app.wait_state(0, connected("192.168.7.23"))
     assert settle(app) == IDLE
-    assert [row[4] for row in app.networks()] == ["Disconnect", connected("192.168.7.23")]
-    d.wait_states(5, 5, 2, 3, 4)
+    assert [row[4] for row in app.networks()] == [connected("192.168.7.23"), "Disconnect"]
+    d.wait_states(5, 2, 3, 4)
     for name in LOCKED:
         assert app.sensitive(name)
     assert not app.sensitive("button-active-device")
@@ -148,24 +168,31 @@ def test_a_whole_connect_and_back(device):
     assert "WIRELESS-LAN-DEBUG: acquire address successed.\n" in app.stderr()
     assert "WIRELESS-LAN-DEBUG: address:192.168.7.23\n" in app.stderr()
 
-    # The chain is over: time brings nothing more.
+    # Time brings nothing more.
     d.clear_commands()
     polls = app.stderr().count("detect_network_interface_state")
     pass_time(d, app, 60000)
     assert app.stderr().count("detect_network_interface_state") == polls
     assert d.commands() == []
 
-    # The button takes the same network down, and nothing else happens.
-    connect(app, 1)
+
+
+def test_the_button_takes_the_same_network_down(device):
+    d, app = idle(device, *TWO)
+    connect(app, 0)
+    wait_commands(d, app)
+    arrive(d, app, 0)
+    d.clear_commands()
+    connect(app, 0)
     app.wait_printed("WIRELESS-LAN-DEBUG: now is link down.\n")
     settle(app)
     assert app.sensitive("button-connect") and settle(app) == IDLE
-    app.wait_state(1, connected("192.168.7.23"))
+    app.wait_state(0, connected("192.168.7.23"))
     pass_time(d, app, 100)
-    app.wait_state(1, "Disconnect")
+    app.wait_state(0, "Disconnect")
     assert [one.argv for one in d.commands()] == [["cat", "/proc/net/wireless"],
                                                   ["/sbin/lnk-ifdown", "wlan0"]]
-    d.wait_states(5, 5, 2, 3, 4, 2)
+    d.wait_states(5, 2, 3, 4, 2)
     assert [row[4] for row in app.networks()] == ["Disconnect", "Disconnect"]
     assert app.label("button-connect") == "gtk-connect"
     assert app.quit() == 0
@@ -202,7 +229,7 @@ def test_preconditions(device):
     notice.wait_gone()
     assert "WIRELESS-LAN-DEBUG: Choice to Connect index[-1],count[1]\n" in app.stderr()
 
-    # No device any more: nothing to be seen, nothing left behind.
+    # No device any more: nothing to be seen, nothing left over.
     app.click_row("view-press", 0)
     d.set_interfaces()
     app.press("button-connect")
@@ -283,7 +310,7 @@ def test_names_and_keys_that_fight_back(device):
                                     for number, text in enumerate(FIGHTERS)]))
     for row, text in enumerate(texts):
         connect(app, row)
-        # The key stands in the dialog already, and is not offered again.
+        # The key is in the dialog already, and is not offered again.
         answer_key(app, None, offer=None)
         wait_commands(d, app, row + 1)
         assert told(d) == ["/sbin/iwset"] + (["wpa"] if row % 2 else []) + [
@@ -327,7 +354,7 @@ def test_files_for_scripts_are_made_anew(device):
         assert stat.S_ISREG(status.st_mode) and stat.S_IMODE(status.st_mode) == mode
     arrive(d, app, 0)
 
-    # A file that stood there open to all does not stay so.
+    # A file that was there, open to all, does not stay so.
     d.sh("chmod 666 /tmp/key_tmp")
     refresh(d, app)
     d.dissociate()

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Connects on a device where something is missing, fails, or takes its time."""
 
 import os
@@ -92,7 +93,7 @@ def test_commands_that_are_missing_or_fail(device):
     pass_time(d, app, 100)
     poll_link(d, app)
     assert d.file("/tmp/essid_tmp") == b"one\n"
-    # The access point comes all the same; the script that is not there leaves nothing behind.
+    # The access point comes all the same; the script that is not there leaves nothing over.
     d.associate(address_of(0))
     poll_link(d, app)
     assert settle(app) == ACQUIRING

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The dialog of an encrypted network, and the offer to keep its key."""
 
 import re
@@ -327,7 +328,7 @@ def test_keeping_networks(device):
     assert app.registered_rows("user_cell_list_front") == [["At home"], ["friend"]]
     arrive(d, app, 1)
 
-    # The kept key stands in the dialog at once; a changed one makes another row.
+    # The kept key is in the dialog at once; a changed one makes another row.
     connect(app, 0)
     dialog = app.dialog("Encrypted Network")
     assert answers(dialog) == ("secret one", False, 1, 0)

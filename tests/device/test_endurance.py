@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Five hundred refreshes leave the program as it was."""
 
 from harness import wait_until

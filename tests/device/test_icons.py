@@ -123,7 +123,8 @@ def test_nothing_is_searched_where_no_theme_is_chosen(street):
 
 
 class Manager:
-    """A settings manager with one setting (https://specifications.freedesktop.org/xsettings-spec)."""
+    """A settings manager with one setting
+    (https://specifications.freedesktop.org/xsettings-spec)."""
 
     def __init__(self, name):
         self.display = xdisplay.Display(name)

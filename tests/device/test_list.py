@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The network list: the refresh and its states, the match with the access point, the rows."""
 
 import pytest
@@ -38,7 +39,7 @@ def states(app):
 def test_controls_during_a_refresh(device):
     d = device("street", rate=0)
     app = d.start()
-    # Time stands still: the scan, 100 ms away, does not come.
+    # No time passes: the scan, 100 ms away, does not come.
     wait_controls(app, "------", "Searching...")
     assert app.networks() == []
     assert d.commands("iwlist") == [] and d.states() == []

@@ -1,4 +1,5 @@
-"""The pollers behind a connect: their limits, texts, notices, and the controls they give back."""
+# SPDX-License-Identifier: MIT
+"""The pollers of a connect: their limits, texts, notices, and the controls they give back."""
 
 import subprocess
 
@@ -17,8 +18,8 @@ def address_polls(printed):
 
 
 def poll_until(d, app, line, start=0):
-    """Lets 2 s pass again and again until the line is printed behind `start`. Returns what was
-    printed before it, and the place behind it."""
+    """Lets 2 s pass again and again until the line is printed after `start`. Returns what was
+    printed before it, and the place after it."""
     for _ in range(60):
         before, found, _ = app.stderr()[start:].partition(line)
         if found:
@@ -212,14 +213,15 @@ def test_hosting_needs_no_address(device):
         assert not app.sensitive(name)
 
 
-def catalogue(folder):
+def catalogue(directory):
     """Every text of the program with a mark before it, as a message catalogue."""
     texts = ["Wireless network selection", "Connect network...",
              "Connected\\nAcquire IP address...", "Connected\\nIP Address",
              "Connected\\nIP address invalid", "Not Connect", "Disconnect"]
     source = 'msgid ""\nmsgstr "Content-Type: text/plain; charset=UTF-8\\n"\n\n'
     source += "".join(f'msgid "{text}"\nmsgstr "· {text}"\n\n' for text in texts)
-    done = subprocess.run(["msgfmt", "-o", "-", "-"], input=source.encode(), cwd=folder, check=True,
+    done = subprocess.run(["msgfmt", "-o", "-", "-"], input=source.encode(), cwd=directory,
+                          check=True,
                           stdout=subprocess.PIPE)
     return {"/share/locale/de/LC_MESSAGES/wireless-lan.mo": done.stdout}
 
@@ -241,7 +243,7 @@ def test_texts_are_translated_but_for_one(device, tmp_path):
         pass_time(d, app, 100)
         d.wait_command("iwset", count)
 
-    # The title behind a connect that found nobody is the one text in English.
+    # The title after a connect that found nobody is the one text in English.
     join(0, 1)
     poll_link(d, app, 21)
     app.wait_state(0, "· Not Connect")

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """What the desktop reads on the root window."""
 
 STRING, BYTES, REPLACE = 31, 8, 0

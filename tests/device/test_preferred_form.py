@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Adding a preferred network, and editing one: the form, its toggles, what it refuses."""
 
 import pytest
@@ -339,7 +340,7 @@ def test_properties(device):
 
 
 def test_properties_refused(device):
-    """What stands before a refused entry is in the row already, also when the form is cancelled."""
+    """What comes before a refused entry is in the row already, also when the form is cancelled."""
     d, app = start(device, HOME, CAFE)
     dialog = open_list(app)
     k = PROPERTIES_KEYS

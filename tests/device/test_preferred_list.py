@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The list of preferred networks: its dialog, the order, deletion, OK and Cancel."""
 
 import os
@@ -108,7 +109,7 @@ def test_order(device):
     dialog = open_list(app)
     select(dialog, 1)
     # A second click takes the highlight away for a moment only: the buttons act on the row still.
-    # It stands apart from the first, so that the two are no double click.
+    # It comes long after the first, so that the two are no double click.
     x, y, width, height = dialog.cell(FRONT, 1)
     d.display.click(x + 3 * width // 4, y + height // 2)
     change(dialog, "gtk-go-down", ["Home", "Office", "cafe"])
@@ -157,13 +158,20 @@ def test_order(device):
     assert app.quit() == 0
 
 
-def test_delete(device):
-    named = Network("net", "<b>&amp;</b> %s _x")
-    d, app = start(device, HOME, CAFE, named, DESK)
-    dialog = open_list(app)
-    select(dialog, 2)
+NAMED = Network("net", "<b>&amp;</b> %s _x")
+
+
+def ask_delete(dialog, row):
+    """Selects a row and presses Delete; the question."""
+    select(dialog, row)
     dialog.press("preferred_button_delete")
-    question = app.dialog(DELETE)
+    return dialog.app.dialog(DELETE)
+
+
+def test_question_before_a_delete(device):
+    d, app = start(device, HOME, CAFE, NAMED, DESK)
+    dialog = open_list(app)
+    question = ask_delete(dialog, 2)
     tree = question.tree()
     own = props(question, tree)
     assert own["transient-for"]["id"] == dialog.tree()["id"]
@@ -182,21 +190,31 @@ def test_delete(device):
     image = next(one for one in table["children"] if one["type"] == "GtkImage")
     assert place(question, image) == [0, 1, 1, 2]
     assert props(question, image)["stock"] == "gtk-dialog-warning"
-    # The name stands there as it was typed.
+    # The name is there as it was typed.
     label = tree.find(text="Do you want to detele the network\n<b>&amp;</b> %s _x?")
     assert place(question, label) == [1, 2, 1, 2]
     own = props(question, label)
     assert (own["justify"], own["wrap"], own["use-markup"], own["xalign"], own["yalign"]) == \
         ("center", True, True, 0, 0.5)
 
-    # Cancel and the window's close button keep the network.
-    close(question, "gtk-cancel")
+
+
+def test_cancel_and_the_close_button_delete_nothing(device):
+    d, app = start(device, HOME, CAFE, NAMED, DESK)
+    dialog = open_list(app)
+    close(ask_delete(dialog, 2), "gtk-cancel")
     dialog.press("preferred_button_delete")
-    app.dialog(DELETE)
+    question = app.dialog(DELETE)
     d.display.close_window(DELETE)
     question.wait_gone()
-    assert names(app) == ["Home", "cafe", named.alias, "Office"]
+    assert names(app) == ["Home", "cafe", NAMED.alias, "Office"]
     assert dialog.selected(FRONT) == [2]
+
+
+def test_delete_selects_a_neighbour(device):
+    d, app = start(device, HOME, CAFE, NAMED, DESK)
+    dialog = open_list(app)
+    select(dialog, 2)
 
     def delete(wanted, selected):
         dialog.press("preferred_button_delete")
@@ -217,11 +235,15 @@ def test_delete(device):
     dialog.press("gtk-go-down")
     close(dialog, "gtk-ok")
     d.wait_file(FILE, file_of(CAFE))
+    assert app.quit() == 0
 
-    # Records beyond the count lie still; the next save that needs them takes them.
+
+def test_an_emptied_list(device):
+    """Nothing is selected in it; records beyond the count are used again by the next save."""
+    d, app = start(device, CAFE)
     dialog = open_list(app)
-    select(dialog, 0)
-    delete([], [])
+    close(ask_delete(dialog, 0), "gtk-ok")
+    assert (names(app), app.registered_rows(BACKEND), dialog.selected(FRONT)) == ([], [], [])
     dialog.press("preferred_button_delete")
     dialog.press("preferred_button_properties")
     dialog.press("preferred_button_add")

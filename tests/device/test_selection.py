@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Selecting a network with the pointer."""
 
 import re
@@ -15,7 +16,7 @@ def presses(app):
 
 
 def selections(app):
-    """The connecting and the selected row behind each press."""
+    """The connecting and the selected row after each press."""
     return [tuple(map(int, found)) for found in re.findall(
         r"WIRELESS-LAN-DEBUG: connect_index=(-?\d+),my_wifi->cell_index=\[(-?\d+)\]$",
         app.stderr(), re.M)]

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The dialog with the addressing of the interface: what it shows and how it follows the hand."""
 
 import pytest

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """OK in the settings dialog: what is refused, written, run, told and shown."""
 
 import os
@@ -30,7 +31,7 @@ def printed_since(app, mark):
 
 
 def mark(app):
-    """Forgets the commands; gives where the output stands and the states sent so far."""
+    """Forgets the commands; gives how far the output is and the states sent so far."""
     app.device.clear_commands()
     return len(app.stdout()), len(app.stderr()), app.device.states()
 
@@ -261,7 +262,7 @@ def test_failed_write_is_told(app):
     before = dhcp(essid="board")
     settings = Settings(app, before)
     settings.toggle("adhoc-host")
-    # Neither the file nor its folder takes a byte.
+    # Neither the file nor its directory takes a byte.
     device.sh("mount --bind /etc /etc && mount -o remount,ro,bind /etc")
     at = mark(app)
     try:

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The simulated device itself: what the other tests rely on."""
 
 import os
@@ -29,14 +30,15 @@ def test_the_machine_stays_as_it_was():
 
 def test_an_ordinary_user_can_run_it():
     # Where nobody, too, can read it, wherever the checkout is.
-    with tempfile.TemporaryDirectory(dir="/tmp") as folder:
-        os.chmod(folder, 0o755)
-        shutil.copytree(f"{TOP}/device", f"{folder}/device")
-        os.mkdir(f"{folder}/tmp")
-        os.chmod(f"{folder}/tmp", 0o777)
+    with tempfile.TemporaryDirectory(dir="/tmp") as directory:
+        os.chmod(directory, 0o755)
+        shutil.copytree(f"{TOP}/device", f"{directory}/device")
+        os.mkdir(f"{directory}/tmp")
+        os.chmod(f"{directory}/tmp", 0o777)
         nobody = ["setpriv", "--reuid=65534", "--regid=65534", "--clear-groups"]
-        done = run(*(nobody if os.getuid() == 0 else []), "env", f"HOME={folder}",
-                   f"TMPDIR={folder}/tmp", f"{folder}/device/simulate", "connected", "sh", "-c",
+        done = run(*(nobody if os.getuid() == 0 else []), "env", f"HOME={directory}",
+                   f"TMPDIR={directory}/tmp", f"{directory}/device/simulate", "connected",
+                   "sh", "-c",
                    "id -u; touch /etc/mine; ip -4 -o address show wlan0; /sbin/iwset a; echo done",
                    cwd="/")
     assert done.stdout.startswith("0\n") and "192.168.7.23/24" in done.stdout, done.stdout

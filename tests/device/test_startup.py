@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Start-up, the main window widget for widget, translated texts, and the end."""
 
 import gettext

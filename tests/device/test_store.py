@@ -1,5 +1,6 @@
-"""The preferred networks between file, records and lists: what start-up reads, what a save leaves
-behind, and what happens when it cannot be written."""
+# SPDX-License-Identifier: MIT
+"""The preferred networks between file, records and lists: what start-up reads, what a save leaves,
+and what happens when it cannot be written."""
 
 import os
 import stat
@@ -86,7 +87,7 @@ def test_missing_file(device):
     f"ln -s {FILE} {FILE}",
 ])
 def test_what_is_no_file(device, make):
-    """A folder under the file's name, and a link that leads to itself."""
+    """A directory under the file's name, and a link that leads to itself."""
     d = device("street")
     d.sh(make)
     app = d.start()
@@ -102,7 +103,7 @@ def test_what_is_no_file(device, make):
     assert app.quit() == 0
 
 
-def test_behind_a_link(device):
+def test_through_a_link(device):
     d = device("street", files={"/home/real.conf": file_of(HOME)})
     d.sh(f"mkdir -p /home; chmod 640 /home/real.conf; ln -s ../home/real.conf {FILE}")
     app = d.start()

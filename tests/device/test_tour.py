@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """One walk through the whole program, as its owner takes it on the first evening."""
 
 from connecting import IDLE, OFFER, connected, preferred
@@ -15,50 +16,63 @@ UP = ["ifconfig", "wlan0", "up"]
 IF_UP = ["lnk-ifup", "wlan0"]
 
 
-def choose(app, row):
-    app.click_row("view-press", row)
-    app.press("button-connect")
+class Tour:
+    """The device and what it was told since the last look."""
 
+    def __init__(self, device):
+        self.device = device("street", rate=RATE)
+        self.addresses_from(LEASE)
+        self.app = self.device.start()
+        self.networks = self.app.wait_listed()
+        self.seen = []
 
-def test_tour(device):
-    d = device("street", rate=RATE)
-    d.command("lnk-ifup", hook=f"address {LEASE} $1")
-    seen = []
+    def addresses_from(self, address):
+        """What the next lnk-ifup gives."""
+        self.device.command("lnk-ifup", hook=f"address {address} $1")
 
-    def told():
-        """The commands since the last look, discoveries left out."""
-        found = [one.argv for one in d.commands() if one.name != "cat"]
-        d.clear_commands()
+    def told(self):
+        """The commands, discoveries left out."""
+        found = [one.argv for one in self.device.commands() if one.name != "cat"]
+        self.device.clear_commands()
         return found
 
-    def sent(*states):
-        """These states since the last look, and no other."""
-        d.wait_states(*seen, *states)
-        seen.extend(states)
+    def sent(self, *states):
+        """These states, and no other."""
+        self.device.wait_states(*self.seen, *states)
+        self.seen.extend(states)
 
-    def apply(settings):
+    def conf(self):
+        return self.device.file(CONF).decode()
+
+    def choose(self):
+        self.app.click_row("view-press", ROW)
+        self.app.press("button-connect")
+
+    def apply(self, settings):
         """OK; the new address is there before the first look at it."""
-        d.clock.rate = 0
+        self.device.clock.rate = 0
         settings.ok()
-        d.wait_command("lnk-ifup")
-        d.clock.rate = RATE
+        self.device.wait_command("lnk-ifup")
+        self.device.clock.rate = RATE
 
-    # The first start finds the street.
-    app = d.start()
-    networks = app.wait_listed()
-    assert networks[ROW] == ["Haus 14", "Master", "on", "64/100", "Disconnect"]
-    sent(5)
-    told()
 
-    # A refresh with the same air changes nothing.
-    app.press("button-refresh")
-    d.wait_command("iwlist")
-    assert app.wait_listed() == networks
-    sent(5)
-    assert told() == [["/sbin/ifconfig", "wlan0", "up"], ["iwlist", "wlan0", "scan"]]
+def look_around(tour):
+    assert tour.networks[ROW] == ["Haus 14", "Master", "on", "64/100", "Disconnect"]
+    tour.sent(5)
+    tour.told()
 
-    # Joining with WPA; the key is remembered under a name of its own.
-    choose(app, ROW)
+
+def refresh_with_the_same_air(tour):
+    tour.app.press("button-refresh")
+    tour.device.wait_command("iwlist")
+    assert tour.app.wait_listed() == tour.networks
+    tour.sent(5)
+    assert tour.told() == [["/sbin/ifconfig", "wlan0", "up"], ["iwlist", "wlan0", "scan"]]
+
+
+def join_and_remember(tour):
+    app, d = tour.app, tour.device
+    tour.choose()
     key = app.dialog("Encrypted Network")
     key.type("connect_key", "correct-horse")
     key.choose("Authentication_ComboBox", 1)
@@ -68,82 +82,107 @@ def test_tour(device):
     offer.press("gtk-yes")
     app.wait_state(ROW, connected(LEASE))
     app.wait_title(IDLE)
-    sent(2, 3, 4)
-    assert told() == [["/sbin/ifconfig", "wlan0", "up"], WPA, IF_UP]
+    tour.sent(2, 3, 4)
+    assert tour.told() == [["/sbin/ifconfig", "wlan0", "up"], WPA, IF_UP]
     assert d.file("/tmp/essid_tmp") == b"Haus 14\n"
     assert d.file("/tmp/key_tmp") == b"correct-horse\n"
     assert d.file(FILE) == HOME
     assert app.label("button-connect") == "gtk-disconnect"
 
-    # A fixed address.
-    d.command("lnk-ifup", hook=f"address {FIXED} $1")
-    settings = Settings(app)
+
+def take_a_fixed_address(tour):
+    tour.addresses_from(FIXED)
+    settings = Settings(tour.app)
     settings.toggle("static")
     for prefix, text in zip(PREFIXES, ADDRESSES):
         settings.pane.type(prefix, text)
-    apply(settings)
-    app.wait_state(ROW, connected(FIXED))
-    assert told() == [IF_UP]
-    sent(2, 4)
-    assert d.file(CONF).decode() == static()
+    tour.apply(settings)
+    tour.app.wait_state(ROW, connected(FIXED))
+    assert tour.told() == [IF_UP]
+    tour.sent(2, 4)
+    assert tour.conf() == static()
 
-    # The device hosts a network of its own.
-    settings = Settings(app)
+
+def host_a_network(tour):
+    settings = Settings(tour.app)
     settings.toggle("adhoc-host")
     information = settings.open_group()
     information.type("GtkEntry", "the board")
     information.press("gtk-ok")
     information.wait_gone()
-    apply(settings)
-    assert told() == [UP, HOST, IF_UP]
-    sent(3)
-    assert app.text("title-label") == "Ad-Hoc Host Mode"
-    assert not any(app.sensitive(key) for key in ("view-press", "button-connect", "button-refresh"))
-    assert d.file(CONF).decode() == static(host=1, essid="the board")
+    tour.apply(settings)
+    assert tour.told() == [UP, HOST, IF_UP]
+    tour.sent(3)
+    assert tour.app.text("title-label") == "Ad-Hoc Host Mode"
+    assert not any(tour.app.sensitive(key) for key in
+                   ("view-press", "button-connect", "button-refresh"))
+    assert tour.conf() == static(host=1, essid="the board")
 
-    # And no longer. The network's name is read back up to its first blank.
-    settings = Settings(app)
+
+def host_no_longer(tour):
+    # The network's name is read back up to its first blank.
+    settings = Settings(tour.app)
     settings.toggle("adhoc-host")
-    apply(settings)
-    app.wait_state(ROW, connected(FIXED))
-    app.wait_title(IDLE)
-    assert told() == [IF_UP]
-    sent(2, 4)
-    assert d.file(CONF).decode() == static(essid="the")
+    tour.apply(settings)
+    tour.app.wait_state(ROW, connected(FIXED))
+    tour.app.wait_title(IDLE)
+    assert tour.told() == [IF_UP]
+    tour.sent(2, 4)
+    assert tour.conf() == static(essid="the")
 
-    # Back to DHCP.
-    d.command("lnk-ifup", hook=f"address {LEASE} $1")
-    settings = Settings(app)
+
+def go_back_to_dhcp(tour):
+    tour.addresses_from(LEASE)
+    settings = Settings(tour.app)
     settings.toggle("dhcp")
-    apply(settings)
-    app.wait_state(ROW, connected(LEASE))
-    assert told() == [IF_UP]
-    sent(2, 4)
-    assert d.file(CONF).decode() == dhcp(essid="the")
+    tour.apply(settings)
+    tour.app.wait_state(ROW, connected(LEASE))
+    assert tour.told() == [IF_UP]
+    tour.sent(2, 4)
+    assert tour.conf() == dhcp(essid="the")
 
-    # Leaving the network.
-    choose(app, ROW)
-    app.wait_state(ROW, "Disconnect")
-    assert told() == [["/sbin/lnk-ifdown", "wlan0"]]
-    sent(2)
-    assert app.label("button-connect") == "gtk-connect"
-    assert app.quit() == 0
 
-    # The next start finds everything as it was left.
-    app = d.start()
-    assert app.wait_listed() == networks
-    assert d.file(CONF).decode() == dhcp(essid="the")
-    assert d.file(FILE) == HOME
-    settings = Settings(app)
+def leave(tour):
+    tour.choose()
+    tour.app.wait_state(ROW, "Disconnect")
+    assert tour.told() == [["/sbin/lnk-ifdown", "wlan0"]]
+    tour.sent(2)
+    assert tour.app.label("button-connect") == "gtk-connect"
+    assert tour.app.quit() == 0
+
+
+def find_everything_as_it_was_left(tour):
+    tour.app = tour.device.start()
+    assert tour.app.wait_listed() == tour.networks
+    assert tour.conf() == dhcp(essid="the")
+    assert tour.device.file(FILE) == HOME
+    settings = Settings(tour.app)
     assert settings.active("dhcp", "static", "auto_dns", "adhoc-host") == [True, False, True, False]
     settings.cancel()
-    told()
-    choose(app, ROW)
-    key = app.dialog("Encrypted Network")
+    tour.told()
+
+
+def join_again_with_the_key_at_hand(tour):
+    tour.choose()
+    key = tour.app.dialog("Encrypted Network")
     assert key.text("connect_key") == "correct-horse"
     assert key.find("Authentication_ComboBox")["active"] == 1
     key.press("gtk-ok")  # known already: not offered again
-    app.wait_state(ROW, connected(LEASE))
-    assert WPA in told()
-    assert d.file(FILE) == HOME
-    assert app.quit() == 0
+    tour.app.wait_state(ROW, connected(LEASE))
+    assert WPA in tour.told()
+    assert tour.device.file(FILE) == HOME
+    assert tour.app.quit() == 0
+
+
+def test_tour(device):
+    tour = Tour(device)
+    look_around(tour)
+    refresh_with_the_same_air(tour)
+    join_and_remember(tour)
+    take_a_fixed_address(tour)
+    host_a_network(tour)
+    host_no_longer(tour)
+    go_back_to_dhcp(tour)
+    leave(tour)
+    find_everything_as_it_was_left(tour)
+    join_again_with_the_key_at_hand(tour)

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """picture.py FILE.xwd: turn the dump of a virtual screen (32 bits a pixel) into FILE.png."""
 
 import struct

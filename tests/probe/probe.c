@@ -4,13 +4,13 @@
 // answers only when the program has nothing more urgent to do: events handled, sizes settled, idle
 // jobs done, all drawn.
 //
-// One question a line, one JSON value a line back. Bytes of texts stand as U+0000 to U+00FF.
+// One question a line, one JSON value a line back. Bytes of texts are written as U+0000 to U+00FF.
 //   tree             every top-level window with all that is in it
 //   props ID         all properties of a widget, and those that its container holds for it
 //   registry KEY     the object the main window holds under the key, or null
 //   rows ID|@KEY     rows of a GtkTreeView, a list store or a GtkCList
 //   columns ID       columns of a GtkTreeView with their renderers
-//   cell ID ROW COL  where a cell stands on the screen
+//   cell ID ROW COL  the place of a cell on the screen
 // ID is the pointer that `tree` gives.
 #include <errno.h>
 #include <gtk/gtk.h>
@@ -430,7 +430,7 @@ static void answer_cell(GString *out, const char *id, int row, int column)
     } else if (GTK_IS_CLIST(widget)) {
         GtkCList *list = GTK_CLIST(widget);
         gdk_window_get_origin(list->clist_window, &x, &y);
-        // Rows stand one under the other, each with a line of one pixel above it.
+        // Rows are one under the other, each with a line of one pixel above it.
         at.x = list->column[column].area.x + list->hoffset;
         at.y = (list->row_height + 1) * row + 1 + list->voffset;
         at.width = list->column[column].area.width;

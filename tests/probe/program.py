@@ -217,7 +217,7 @@ class Pane:
 
     def type(self, name, text, replace=True):
         """Types into an entry, with a click into it when the focus is elsewhere; `replace` takes
-        away what stands there first."""
+        away what it holds."""
         wait_until(lambda: self.tree()["active"], f"{self.description} to be the active window")
         # A click into the entry that has the focus would leave nothing to wait for, and the window
         # manager may hold it back until after the keys.

@@ -73,14 +73,14 @@ def inject(what):
     return ["strace", "-qq", "-o", "/dev/null", "-e", "inject=" + what]
 
 
-def prepare(folder, scene, kind, texts):
-    """The folder of a save, the path to save to and the file that it names."""
-    shutil.rmtree(folder, ignore_errors=True)
-    folder.mkdir()
-    target = folder / "conf"
+def prepare(directory, scene, kind, texts):
+    """The directory of a save, the path to save to and the file that it names."""
+    shutil.rmtree(directory, ignore_errors=True)
+    directory.mkdir()
+    target = directory / "conf"
     path = target
     if scene == "link":
-        path = folder / "link"
+        path = directory / "link"
         path.symlink_to("conf")
     if scene != "new file":
         target.write_bytes(texts[kind, "old"])
@@ -94,14 +94,14 @@ SCENES = ["over a file", "new file", "link", "shorter"]
 @pytest.mark.parametrize("scene", SCENES)
 @pytest.mark.parametrize("kind", KINDS)
 def test_killed_at_every_system_call(kind, scene, tmp_path, texts, capsys):
-    folder = tmp_path / "etc"
+    directory = tmp_path / "etc"
     version = "short" if scene == "shorter" else "new"
     before = None if scene == "new file" else texts[kind, "old"]
-    path, target = prepare(folder, scene, kind, texts)
+    path, target = prepare(directory, scene, kind, texts)
     calls = calls_of_a_save(kind, path, version, tmp_path / "trace")
     outcome = collections.Counter()
     for name, number in calls:
-        path, target = prepare(folder, scene, kind, texts)
+        path, target = prepare(directory, scene, kind, texts)
         status, _ = save(kind, path, version, inject(f"{name}:signal=KILL:when={number}"))
         if status == 0 and name == "exit_group":
             status = -signal.SIGKILL
@@ -112,7 +112,7 @@ def test_killed_at_every_system_call(kind, scene, tmp_path, texts, capsys):
         if found is not None:
             mode = stat.S_IMODE(target.stat().st_mode)
             assert mode == (0o600 if before is None else 0o640), (name, number)
-        left = [p for p in folder.iterdir() if p not in (path, target)]
+        left = [p for p in directory.iterdir() if p not in (path, target)]
         assert len(left) <= 1, (name, number, left)
     with capsys.disabled():
         print(f"\n{kind}, {scene}: killed at {len(calls)} system calls, file whole each time "
@@ -136,13 +136,13 @@ FAULTS = {
 @pytest.mark.parametrize("kind", KINDS)
 def test_an_error_at_every_system_call(kind, tmp_path, texts, capsys):
     """Whatever fails: saved means new, not saved means old and a cause; nothing else is left."""
-    folder = tmp_path / "etc"
-    path, target = prepare(folder, "over a file", kind, texts)
+    directory = tmp_path / "etc"
+    path, target = prepare(directory, "over a file", kind, texts)
     calls = calls_of_a_save(kind, path, "new", tmp_path / "trace")
     saved, refused = 0, 0
     for name, number in calls:
         for error in FAULTS.get(name, []):
-            path, target = prepare(folder, "over a file", kind, texts)
+            path, target = prepare(directory, "over a file", kind, texts)
             status, said = save(kind, path, "new", inject(f"{name}:error={error}:when={number}"))
             found = target.read_bytes()
             if status == 0:
@@ -152,7 +152,7 @@ def test_an_error_at_every_system_call(kind, tmp_path, texts, capsys):
                 refused += 1
                 assert status == 1 and found == texts[kind, "old"], (name, number, error)
                 assert f"{path}: " in said, (name, number, error)
-            assert list(folder.iterdir()) == [target], (name, number, error)
+            assert list(directory.iterdir()) == [target], (name, number, error)
             assert stat.S_IMODE(target.stat().st_mode) == 0o640
     with capsys.disabled():
         print(f"\n{kind}: {saved + refused} errors put in, {saved} saved all the same, "
@@ -163,20 +163,20 @@ def test_an_error_at_every_system_call(kind, tmp_path, texts, capsys):
 @pytest.mark.parametrize("kind", KINDS)
 def test_an_error_while_writing_in_place(kind, tmp_path, texts):
     """With a rename that is impossible, a write that fails puts the old content back."""
-    folder = tmp_path / "etc"
+    directory = tmp_path / "etc"
     for version in ["new", "short"]:
         for fault in ["write:error=EIO:when=2", "fallocate:error=ENOSPC",
                       "ftruncate:error=EIO:when=1", "fsync:error=EIO:when=2"]:
-            path, target = prepare(folder, "over a file", kind, texts)
+            path, target = prepare(directory, "over a file", kind, texts)
             before = [*inject("rename:error=EBUSY"), "-e", "inject=" + fault]
             status, _ = save(kind, path, version, before)
             assert status == 1, fault
             assert target.read_bytes() == texts[kind, "old"], fault
-            assert list(folder.iterdir()) == [target]
+            assert list(directory.iterdir()) == [target]
 
 
 def in_namespace(script, *arguments):
-    """Runs a shell script with the folder of tests as $1 in a mount namespace; its output."""
+    """Runs a shell script with the directory of tests as $1 in a mount namespace; its output."""
     done = run(*UNSHARE, "sh", "-euc", script, "sh", *arguments)
     assert done.returncode == 0, done.stdout + done.stderr
     return done.stdout + done.stderr
@@ -184,8 +184,8 @@ def in_namespace(script, *arguments):
 
 @pytest.mark.parametrize("kind", KINDS)
 def test_a_full_disk_keeps_the_old_file(kind, tmp_path, texts):
-    folder = tmp_path / "small"
-    folder.mkdir()
+    directory = tmp_path / "small"
+    directory.mkdir()
     (tmp_path / "old").write_bytes(texts[kind, "old"])
     said = in_namespace(
         """
@@ -198,9 +198,9 @@ def test_a_full_disk_keeps_the_old_file(kind, tmp_path, texts):
         rm "$1/filler"
         "$4" "$3" "$1/conf" new && echo saved with room
         """,
-        folder, tmp_path / "old", kind, SAVE,
+        directory, tmp_path / "old", kind, SAVE,
     )
-    assert f"WIRELESS-LAN-DEBUG: {folder}/conf: No space left on device\n" in said
+    assert f"WIRELESS-LAN-DEBUG: {directory}/conf: No space left on device\n" in said
     # The file could be opened, so nobody says that it could not.
     assert "cannot be open" not in said
     assert "status 1\nunchanged\n2 entries, mode 640\nsaved with room\n" in said.replace(
@@ -209,8 +209,8 @@ def test_a_full_disk_keeps_the_old_file(kind, tmp_path, texts):
 
 
 def test_a_full_disk_under_a_mount_point_keeps_the_old_content(tmp_path, texts):
-    folder = tmp_path / "small"
-    folder.mkdir()
+    directory = tmp_path / "small"
+    directory.mkdir()
     (tmp_path / "mounted").write_bytes(b"")
     (tmp_path / "old").write_bytes(texts["preferred", "short"])
     said = in_namespace(
@@ -222,7 +222,7 @@ def test_a_full_disk_under_a_mount_point_keeps_the_old_content(tmp_path, texts):
         if "$3" preferred "$4" new; then echo saved; else echo "status $?"; fi
         cmp "$4" "$2" && echo unchanged
         """,
-        folder, tmp_path / "old", SAVE, tmp_path / "mounted",
+        directory, tmp_path / "old", SAVE, tmp_path / "mounted",
     )
     assert "No space left on device" in said and "status 1\nunchanged\n" in said
 
@@ -246,23 +246,23 @@ def test_a_mount_point_is_written_in_place(kind, tmp_path, texts):
 
 @pytest.mark.parametrize("kind", KINDS)
 def test_a_read_only_file_system_keeps_the_old_file(kind, tmp_path, texts):
-    folder = tmp_path / "etc"
-    prepare(folder, "over a file", kind, texts)
+    directory = tmp_path / "etc"
+    prepare(directory, "over a file", kind, texts)
     said = in_namespace(
         """
         mount --bind "$1" "$1"; mount -o remount,bind,ro "$1"
         "$3" "$2" "$1/conf" new || echo "status $?"
         """,
-        folder, kind, SAVE,
+        directory, kind, SAVE,
     )
-    assert f"{folder}/conf: Read-only file system\n" in said and "status 1\n" in said
-    assert (folder / "conf").read_bytes() == texts[kind, "old"]
+    assert f"{directory}/conf: Read-only file system\n" in said and "status 1\n" in said
+    assert (directory / "conf").read_bytes() == texts[kind, "old"]
 
 
 @pytest.mark.parametrize("kind", KINDS)
-def test_a_read_only_folder_with_a_writable_file_on_it(kind, tmp_path, texts):
-    folder = tmp_path / "etc"
-    prepare(folder, "over a file", kind, texts)
+def test_a_read_only_directory_with_a_writable_file_on_it(kind, tmp_path, texts):
+    directory = tmp_path / "etc"
+    prepare(directory, "over a file", kind, texts)
     (tmp_path / "writable").write_bytes(texts[kind, "old"])
     said = in_namespace(
         """
@@ -270,7 +270,7 @@ def test_a_read_only_folder_with_a_writable_file_on_it(kind, tmp_path, texts):
         mount --bind "$4" "$1/conf"
         "$3" "$2" "$1/conf" new && echo saved
         """,
-        folder, kind, SAVE, tmp_path / "writable",
+        directory, kind, SAVE, tmp_path / "writable",
     )
     assert "saved\n" in said
     assert (tmp_path / "writable").read_bytes() == texts[kind, "new"]
@@ -281,8 +281,8 @@ def as_user(uid):
 
 
 @pytest.fixture
-def public_folder(tmp_path):
-    """A folder that every user can reach, which pytest's are not."""
+def public_directory(tmp_path):
+    """A directory that every user can reach, which pytest's are not."""
     path = pathlib.Path("/tmp") / f"wireless-lan-save-{os.getpid()}"
     path.mkdir()
     program = path / "save"
@@ -308,14 +308,14 @@ def test_mode_and_owner_are_kept(kind, tmp_path, texts):
 
 @as_root
 @pytest.mark.parametrize("kind", KINDS)
-def test_a_folder_of_another_user(kind, public_folder, texts):
-    """The file is ours, the folder is not: written in place."""
-    folder = public_folder / "etc"
-    folder.mkdir(mode=0o755)
-    target = folder / "conf"
+def test_a_directory_of_another_user(kind, public_directory, texts):
+    """The file is ours, the directory is not: written in place."""
+    directory = public_directory / "etc"
+    directory.mkdir(mode=0o755)
+    target = directory / "conf"
     target.write_bytes(texts[kind, "old"])
     os.chown(target, 1234, 1234)
-    done = run(*as_user(1234), public_folder / "save", kind, target, "short")
+    done = run(*as_user(1234), public_directory / "save", kind, target, "short")
     assert done.returncode == 0
     assert target.read_bytes() == texts[kind, "short"]
     assert target.stat().st_uid == 1234
@@ -323,28 +323,28 @@ def test_a_folder_of_another_user(kind, public_folder, texts):
 
 @as_root
 @pytest.mark.parametrize("kind", KINDS)
-def test_a_file_of_another_user(kind, public_folder, texts):
-    """The folder is ours, the file is not: it keeps its owner where we may write it, else all."""
-    folder = public_folder / "etc"
-    folder.mkdir()
-    folder.chmod(0o777)
-    target = folder / "conf"
+def test_a_file_of_another_user(kind, public_directory, texts):
+    """The file keeps its owner where we may write it, else all, though the directory is ours."""
+    directory = public_directory / "etc"
+    directory.mkdir()
+    directory.chmod(0o777)
+    target = directory / "conf"
     for mode, saved in [(0o666, True), (0o644, False)]:
         target.write_bytes(texts[kind, "old"])
         target.chmod(mode)
-        done = run(*as_user(1234), public_folder / "save", kind, target, "new")
+        done = run(*as_user(1234), public_directory / "save", kind, target, "new")
         assert (done.returncode == 0) == saved
         assert target.read_bytes() == texts[kind, "new" if saved else "old"]
         assert saved or f"{target}: Permission denied\n" in done.stderr
-        assert target.stat().st_uid == 0 and list(folder.iterdir()) == [target]
+        assert target.stat().st_uid == 0 and list(directory.iterdir()) == [target]
 
 
 @pytest.mark.parametrize("kind", KINDS)
 def test_what_is_no_file_is_left_alone(kind, tmp_path):
-    (tmp_path / "folder").mkdir()
+    (tmp_path / "directory").mkdir()
     (tmp_path / "circle").symlink_to("circle")
     (tmp_path / "null").symlink_to("/dev/null")
-    for name, cause in [("folder", "Is a directory"), ("null", "Operation not supported"),
+    for name, cause in [("directory", "Is a directory"), ("null", "Operation not supported"),
                         ("circle", "Too many levels of symbolic links"),
                         ("missing/conf", "No such file or directory")]:
         status, said = save(kind, tmp_path / name, "new")

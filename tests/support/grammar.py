@@ -61,7 +61,7 @@ def read_interfaces(text):
 
 
 def to_bytes(text):
-    """A text as bytes; a surrogate stands for a byte that is no UTF-8."""
+    """A text as bytes; a byte that is no UTF-8 is a surrogate in it."""
     return text if isinstance(text, bytes) else text.encode("utf-8", "surrogateescape")
 
 

@@ -43,8 +43,8 @@ class App(Program):
 
     def descriptors(self):
         """What each of its open descriptors is: {number: target}."""
-        folder = f"/proc/{self.pid}/fd"
-        return {int(number): os.readlink(f"{folder}/{number}") for number in os.listdir(folder)}
+        directory = f"/proc/{self.pid}/fd"
+        return {int(name): os.readlink(f"{directory}/{name}") for name in os.listdir(directory)}
 
     def sanitized(self):
         """Whether this is a build with sanitizers."""

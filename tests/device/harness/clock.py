@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The program's time, ruled by the test; the page is read by device/sim/clock.c."""
 
 import mmap
@@ -35,7 +36,7 @@ class Clock:
 
     @rate.setter
     def rate(self, rate):
-        """From now on, time passes `rate` times as fast as real time; 0: it stands still."""
+        """From now on, time passes `rate` times as fast as real time; 0: it does not pass."""
         self._settle()
         self._rate = float(rate)
         self._write()

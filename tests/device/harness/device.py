@@ -1,4 +1,5 @@
-"""The simulated device of one test: a folder of state, namespaces, a screen, and the program."""
+# SPDX-License-Identifier: MIT
+"""The simulated device of one test: a directory of state, namespaces, a screen, and the program."""
 
 import json
 import os
@@ -39,11 +40,11 @@ class Command:
 
 
 def built():
-    """The folder with the device's tools and the probe, built when their sources are newer."""
-    folder = subprocess.run([f"{TOP}/device/sim/build"], check=True, stdout=subprocess.PIPE,
+    """The directory with the device's tools and the probe, built when their sources are newer."""
+    directory = subprocess.run([f"{TOP}/device/sim/build"], check=True, stdout=subprocess.PIPE,
                             text=True).stdout.strip()
-    subprocess.run([f"{TOP}/tests/probe/build", f"{folder}/probe.so"], check=True)
-    return folder
+    subprocess.run([f"{TOP}/tests/probe/build", f"{directory}/probe.so"], check=True)
+    return directory
 
 
 class Device:
@@ -211,7 +212,7 @@ class Device:
             return b""
 
     def put(self, name, content, mode=0o644):
-        """Writes a file of the state folder, whole at once."""
+        """Writes a file of the state directory, whole at once."""
         path = f"{self.state}/{name}"
         os.makedirs(os.path.dirname(path), exist_ok=True)
         with open(path + ".new", "wb") as file:
@@ -220,7 +221,7 @@ class Device:
         os.rename(path + ".new", path)
 
     def drop(self, name):
-        """Removes a file of the state folder, if there is one."""
+        """Removes a file of the state directory, if there is one."""
         try:
             os.unlink(f"{self.state}/{name}")
         except FileNotFoundError:
@@ -317,11 +318,11 @@ class Device:
         wait_until(lambda: self.states() == list(states),
                    lambda: f"states {states}; they are {self.states()}", limit)
 
-    def keep(self, folder):
+    def keep(self, directory):
         """Saves what a failed test needs to be understood."""
-        os.makedirs(folder, exist_ok=True)
+        os.makedirs(directory, exist_ok=True)
         if self.display is not None and self.display.alive():
-            self.display.screenshot(f"{folder}/screen.png")
+            self.display.screenshot(f"{directory}/screen.png")
         for name in os.listdir(self.state):
             if re.match(r"(stdout|stderr|log|scan|wireless|ap|simulate|display)", name):
-                shutil.copy(f"{self.state}/{name}", folder)
+                shutil.copy(f"{self.state}/{name}", directory)

@@ -11,9 +11,9 @@ from support.png import save_png
 
 
 class Display(Screen):
-    def __init__(self, folder, size="1024x768", window_manager=True):
+    def __init__(self, directory, size="1024x768", window_manager=True):
         self._processes = []
-        self._log = open(os.path.join(folder, "display.log"), "wb")
+        self._log = open(os.path.join(directory, "display.log"), "wb")
         reading, writing = os.pipe()
         self._start(["Xvfb", "-displayfd", str(writing), "-screen", "0", size + "x24",
                      "-nolisten", "tcp", "-noreset"], pass_fds=(writing,))
@@ -24,8 +24,8 @@ class Display(Screen):
             raise AssertionError("Xvfb did not start; see display.log")
         super().__init__(":" + number)
         if window_manager:
-            environment = {"PATH": os.environ["PATH"], "DISPLAY": self.name, "HOME": folder,
-                           "XDG_CONFIG_HOME": folder, "XDG_CACHE_HOME": folder, "LANG": "C"}
+            environment = {"PATH": os.environ["PATH"], "DISPLAY": self.name, "HOME": directory,
+                           "XDG_CONFIG_HOME": directory, "XDG_CACHE_HOME": directory, "LANG": "C"}
             self._start(["openbox", "--sm-disable"], env=environment)
             self.wait_window_manager()
 

@@ -101,7 +101,7 @@ def select(row):
 
 
 def photograph(name):
-    """Keeps what the screen shows once it stands still; tests/lab/run makes a picture of it."""
+    """Keeps what the screen shows once it is at rest; tests/lab/run makes a picture of it."""
     last = None
     for _ in range(20):
         with open("/tmp/screen/Xvfb_screen0", "rb") as file:
