@@ -9,7 +9,9 @@
 
 #include "wifi_info/debug.h"
 
-void send_atom_to_desktop(const gchar *atom_str, int data)
+// Replaces the root-window property `atom_str` (type STRING, format 8) by `data` as decimal text.
+// It leaves at once, since a command that blocks the main loop may follow. NULL: nothing is done.
+static void send_atom_to_desktop(const gchar *atom_str, int data)
 {
     if (atom_str == nullptr)
         return;

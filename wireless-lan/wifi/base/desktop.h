@@ -13,10 +13,6 @@ enum desktop_status : int {
     STATUS_SCANNING = 5
 };
 
-// Replaces the root-window property `atom_str` (type STRING, format 8) by `data` as decimal text.
-// It leaves at once, since a command that blocks the main loop may follow. NULL: nothing is done.
-void send_atom_to_desktop(const gchar *atom_str, int data);
-
 // Sends "_NET_WIFI_CHANGE_STATUS".
 void send_status_to_desktop(desktop_status status);
 

@@ -63,6 +63,65 @@ static int next_match(GtkWidget *backend, int row)
     return -1;
 }
 
+static gboolean wep_active(GtkWidget *authentication)
+{
+    return gtk_combo_box_get_active(GTK_COMBO_BOX(authentication)) == 0;
+}
+
+// "changed" of the authentication combo: only WEP keys have an index.
+static void cb_key_index_stat(GtkWidget *, gpointer)
+{
+    GtkWidget *authentication = find_widget(AUTHENTICATION_KEY);
+
+    if (authentication != nullptr)
+        set_widget_sensitive(KEY_INDEX_KEY, wep_active(authentication));
+}
+
+// Copies the active item of the combo under `key` into a record and a global.
+static void take_active(const char *key, guint32 *field, int *global)
+{
+    GtkWidget *combo = find_widget(key);
+
+    if (combo == nullptr)
+        return;
+    *global = gtk_combo_box_get_active(GTK_COMBO_BOX(combo));
+    *field = static_cast<guint32>(*global);
+}
+
+// "changed" of the preferred combo: fills the chosen network's key in, hidden, and takes the shown
+// key management and key index over into its record, key_mgmt and key_index.
+static void cb_change_network(GtkWidget *combobox, gpointer)
+{
+    GtkWidget *backend = backend_list();
+    const int position = gtk_combo_box_get_active(GTK_COMBO_BOX(combobox));
+
+    if (backend == nullptr || position < 0)
+        return;
+
+    int row = next_match(backend, 0);
+
+    for (int i = 0; i < position && row >= 0; i++)
+        row = next_match(backend, row + 1);
+    if (row < 0)
+        return;
+
+    WIFI_CELL *record = my_wifi->user_wifi_cell[row];
+    GtkWidget *entry = find_widget(ENTRY_KEY);
+
+    if (entry != nullptr) {
+        // Visible while it is filled: that is no touch of a hidden key.
+        gtk_entry_set_visibility(GTK_ENTRY(entry), TRUE);
+        fill_text_entry(entry, record->userkey);
+        gtk_entry_set_visibility(GTK_ENTRY(entry), FALSE);
+        wipe_text(&sel_key);
+        sel_key = g_strdup(record->userkey);
+    }
+    // The record takes over what is shown, not the other way round: the combos show the last
+    // network of the name, and a changed answer is recognised against these two.
+    take_active(AUTHENTICATION_KEY, &record->key_mgmt, &key_mgmt);
+    take_active(KEY_INDEX_KEY, &record->key_index, &key_index);
+}
+
 static GtkWidget *text_combo(std::initializer_list<const char *> items)
 {
     GtkWidget *combo = gtk_combo_box_new_text();
@@ -132,62 +191,6 @@ GtkWidget *create_ComboBox(int *n)
     return combo;
 }
 
-static gboolean wep_active(GtkWidget *authentication)
-{
-    return gtk_combo_box_get_active(GTK_COMBO_BOX(authentication)) == 0;
-}
-
-void cb_key_index_stat(GtkWidget *, gpointer)
-{
-    GtkWidget *authentication = find_widget(AUTHENTICATION_KEY);
-
-    if (authentication != nullptr)
-        set_widget_sensitive(KEY_INDEX_KEY, wep_active(authentication));
-}
-
-// Copies the active item of the combo under `key` into a record and a global.
-static void take_active(const char *key, guint32 *field, int *global)
-{
-    GtkWidget *combo = find_widget(key);
-
-    if (combo == nullptr)
-        return;
-    *global = gtk_combo_box_get_active(GTK_COMBO_BOX(combo));
-    *field = static_cast<guint32>(*global);
-}
-
-void cb_change_network(GtkWidget *combobox, gpointer)
-{
-    GtkWidget *backend = backend_list();
-    const int position = gtk_combo_box_get_active(GTK_COMBO_BOX(combobox));
-
-    if (backend == nullptr || position < 0)
-        return;
-
-    int row = next_match(backend, 0);
-
-    for (int i = 0; i < position && row >= 0; i++)
-        row = next_match(backend, row + 1);
-    if (row < 0)
-        return;
-
-    WIFI_CELL *record = my_wifi->user_wifi_cell[row];
-    GtkWidget *entry = find_widget(ENTRY_KEY);
-
-    if (entry != nullptr) {
-        // Visible while it is filled: that is no touch of a hidden key.
-        gtk_entry_set_visibility(GTK_ENTRY(entry), TRUE);
-        fill_text_entry(entry, record->userkey);
-        gtk_entry_set_visibility(GTK_ENTRY(entry), FALSE);
-        wipe_text(&sel_key);
-        sel_key = g_strdup(record->userkey);
-    }
-    // The record takes over what is shown, not the other way round: the combos show the last
-    // network of the name, and a changed answer is recognised against these two.
-    take_active(AUTHENTICATION_KEY, &record->key_mgmt, &key_mgmt);
-    take_active(KEY_INDEX_KEY, &record->key_index, &key_index);
-}
-
 static void remove_hidden_key(GtkEditable *editable)
 {
     gtk_entry_set_visibility(GTK_ENTRY(editable), TRUE);
@@ -212,7 +215,9 @@ static void cb_key_deleted(GtkEditable *editable, gint, gint, gpointer)
     g_signal_stop_emission_by_name(editable, "delete-text");
 }
 
-gboolean connect_key_cb(GdkEventKey *)
+// "backspace" of the key entry, before the entry's own handling: a hidden key goes as a whole, and
+// what is typed then can be read. Always FALSE.
+static gboolean connect_key_cb(GdkEventKey *)
 {
     GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
 

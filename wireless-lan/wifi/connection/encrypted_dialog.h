@@ -28,15 +28,4 @@ GtkWidget *create_Authentication_ComboBox();
 GtkWidget *create_Key_Index_ComboBox();
 GtkWidget *create_ComboBox(int *n);
 
-// "changed" of the authentication combo: only WEP keys have an index.
-void cb_key_index_stat(GtkWidget *combobox, gpointer data);
-
-// "changed" of the preferred combo: fills the chosen network's key in, hidden, and takes the shown
-// key management and key index over into its record, key_mgmt and key_index.
-void cb_change_network(GtkWidget *combobox, gpointer data);
-
-// "backspace" of the key entry, before the entry's own handling: a hidden key goes as a whole, and
-// what is typed then can be read. Always FALSE.
-gboolean connect_key_cb(GdkEventKey *key_event);
-
 #endif

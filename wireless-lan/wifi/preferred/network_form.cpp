@@ -12,6 +12,38 @@
 #include "wifi_info/debug.h"
 #include "wifi_info/text.h"
 
+// WPA has no Ad-Hoc mode, no key state and no key index here; its key state counts as "open".
+static void follow_key_mgmt(const network_form &form, gboolean wpa)
+{
+    set_widget_sensitive(form.mode_container, !wpa);
+    set_widget_sensitive(form.wep_container, !wpa);
+    choose_form_radio(form.enc[wpa ? ENC_OPEN : ENC_OFF]);
+    set_widget_sensitive(form.key_index, !wpa);
+    set_widget_sensitive(form.key_hbox, wpa);
+}
+
+// "toggled" of WEP and WPA; they act on every toggle. The button that gains the choice is signalled
+// last and decides.
+static void change_wep_type(GtkWidget *, gpointer)
+{
+    follow_key_mgmt(add_form, FALSE);
+}
+
+static void change_wpa_type(GtkWidget *, gpointer)
+{
+    follow_key_mgmt(add_form, TRUE);
+}
+
+static void change_prefer_wep_type(GtkWidget *, gpointer)
+{
+    follow_key_mgmt(properties_form, FALSE);
+}
+
+static void change_prefer_wpa_type(GtkWidget *, gpointer)
+{
+    follow_key_mgmt(properties_form, TRUE);
+}
+
 const network_form add_form = {
     N_("Add WiFi Network"),
     "add_alias",
@@ -165,6 +197,24 @@ GtkWidget *create_network_dialog(const network_form &form, GtkWidget *parent)
     return dialog;
 }
 
+// "toggled" of "off", "open" and "restricted": lets a key be entered for the latter two.
+// `user_data` is the key of the box around the key entry.
+static void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data)
+{
+    const auto key_hbox = static_cast<const char *>(user_data);
+
+    if (!gtk_toggle_button_get_active(togglebutton))
+        return;
+    debug_line("user_data:%s", key_hbox);
+
+    const network_form &form =
+        strcmp(key_hbox, add_form.key_hbox) == 0 ? add_form : properties_form;
+    const GtkWidget *widget = GTK_WIDGET(togglebutton);
+
+    set_widget_sensitive(key_hbox, widget == find_widget(form.enc[ENC_OPEN]) ||
+                                       widget == find_widget(form.enc[ENC_RESTRICTED]));
+}
+
 void connect_network_form(const network_form &form)
 {
     const auto connect = [](const char *key, GCallback handler, const char *data) {
@@ -237,50 +287,4 @@ gboolean form_has_key(const network_form &form, GtkWidget *dialog)
         return TRUE;
     show_warring_dialog(dialog, _("Please enter the Key."));
     return FALSE;
-}
-
-// WPA has no Ad-Hoc mode, no key state and no key index here; its key state counts as "open".
-static void follow_key_mgmt(const network_form &form, gboolean wpa)
-{
-    set_widget_sensitive(form.mode_container, !wpa);
-    set_widget_sensitive(form.wep_container, !wpa);
-    choose_form_radio(form.enc[wpa ? ENC_OPEN : ENC_OFF]);
-    set_widget_sensitive(form.key_index, !wpa);
-    set_widget_sensitive(form.key_hbox, wpa);
-}
-
-void change_wep_type(GtkWidget *, gpointer)
-{
-    follow_key_mgmt(add_form, FALSE);
-}
-
-void change_wpa_type(GtkWidget *, gpointer)
-{
-    follow_key_mgmt(add_form, TRUE);
-}
-
-void change_prefer_wep_type(GtkWidget *, gpointer)
-{
-    follow_key_mgmt(properties_form, FALSE);
-}
-
-void change_prefer_wpa_type(GtkWidget *, gpointer)
-{
-    follow_key_mgmt(properties_form, TRUE);
-}
-
-void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data)
-{
-    const auto key_hbox = static_cast<const char *>(user_data);
-
-    if (!gtk_toggle_button_get_active(togglebutton))
-        return;
-    debug_line("user_data:%s", key_hbox);
-
-    const network_form &form =
-        strcmp(key_hbox, add_form.key_hbox) == 0 ? add_form : properties_form;
-    const GtkWidget *widget = GTK_WIDGET(togglebutton);
-
-    set_widget_sensitive(key_hbox, widget == find_widget(form.enc[ENC_OPEN]) ||
-                                       widget == find_widget(form.enc[ENC_RESTRICTED]));
 }

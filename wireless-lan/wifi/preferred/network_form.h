@@ -57,15 +57,4 @@ gchar *form_key_index(const network_form &form); // from "0"; g_free it
 gboolean form_has_essid(const network_form &form, GtkWidget *dialog);
 gboolean form_has_key(const network_form &form, GtkWidget *dialog);
 
-// "toggled" of WEP and WPA; they act on every toggle. The button that gains the choice is signalled
-// last and decides.
-void change_wep_type(GtkWidget *widget, gpointer data);
-void change_wpa_type(GtkWidget *widget, gpointer data);
-void change_prefer_wep_type(GtkWidget *widget, gpointer data);
-void change_prefer_wpa_type(GtkWidget *widget, gpointer data);
-
-// "toggled" of "off", "open" and "restricted": lets a key be entered for the latter two.
-// `user_data` is the key of the box around the key entry.
-void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data);
-
 #endif

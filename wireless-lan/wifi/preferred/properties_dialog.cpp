@@ -39,11 +39,11 @@ static void choose_key_mgmt(gint row)
 {
     if (strcmp(user_cell_text(row, LIST_KEY_MGMT), "1") == 0) {
         choose_form_radio(form.wpa);
-        change_prefer_wpa_type(find_widget(form.wpa), nullptr);
+        form.change_wpa(find_widget(form.wpa), nullptr);
         return;
     }
     choose_form_radio(form.wep);
-    change_prefer_wep_type(find_widget(form.wep), nullptr);
+    form.change_wep(find_widget(form.wep), nullptr);
     choose_form_radio(form.enc[row_encryption(row)]);
 }
 

@@ -93,6 +93,13 @@ gboolean user_cell_lists_exist()
     return find_widget(FRONT_KEY) != nullptr && find_widget(BACKEND_KEY) != nullptr;
 }
 
+// "select-row" of the front list: follows the selection.
+static void clist_select_row(GtkWidget *, gint row, gint column, GdkEventButton *, gpointer)
+{
+    my_wifi->user_cell_index = row;
+    debug_line("select row [%d],column [%d]", row, column);
+}
+
 static gboolean restore_highlight(gpointer)
 {
     if (!user_cell_lists_exist() || my_wifi->user_cell_index < 0 ||
@@ -238,10 +245,4 @@ void show_store_full(GtkWidget *parent)
         g_strdup_printf(_("The list is full: it holds %d networks."), MAX_USER_CELLS);
 
     show_warring_dialog(parent, message);
-}
-
-void clist_select_row(GtkWidget *, gint row, gint column, GdkEventButton *, gpointer)
-{
-    my_wifi->user_cell_index = row;
-    debug_line("select row [%d],column [%d]", row, column);
 }

@@ -68,8 +68,4 @@ void select_user_cell_row(gint row);
 // Shows the message for a list that is full over `parent`.
 void show_store_full(GtkWidget *parent);
 
-// "select-row" of the front list: follows the selection.
-void clist_select_row(GtkWidget *clist, gint row, gint column, GdkEventButton *event,
-                      gpointer data);
-
 #endif

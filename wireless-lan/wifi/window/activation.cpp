@@ -18,6 +18,30 @@ constexpr char MARKER_FILE[] = "/etc/build_in_wifi";
 // The module takes up to six seconds until its interface appears.
 constexpr guint POWER_ON_MS = 6050;
 
+// One-shot timer: looks for the interface again after the module was switched on.
+static gboolean cb_check_wifi(gpointer)
+{
+    GtkWidget *window = find_widget(CHECKING_KEY);
+
+    printf("proc_win=%p\n", static_cast<void *>(window));
+    if (window != nullptr)
+        gtk_widget_destroy(window);
+    release_controls(HOLD_CHECK);
+
+    get_interface();
+    if (my_wifi->interface_count < 1) {
+        show_message_box(nullptr,
+                         _("Can not found any WIFI device.\nPlease confim that you have a WIFI "
+                           "device (either built-in or USB WIFI)."));
+        return FALSE;
+    }
+    if (find_widget(ACTIVATE_BUTTON) != nullptr) {
+        set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
+        cb_refresh_network(nullptr, nullptr);
+    }
+    return FALSE;
+}
+
 static void show_checking_window()
 {
     GtkWidget *window = gtk_window_new(GTK_WINDOW_POPUP);
@@ -47,27 +71,4 @@ void cb_active_device(GtkWidget *, gpointer)
         }
     }
     cb_refresh_network(nullptr, nullptr);
-}
-
-gboolean cb_check_wifi(gpointer)
-{
-    GtkWidget *window = find_widget(CHECKING_KEY);
-
-    printf("proc_win=%p\n", static_cast<void *>(window));
-    if (window != nullptr)
-        gtk_widget_destroy(window);
-    release_controls(HOLD_CHECK);
-
-    get_interface();
-    if (my_wifi->interface_count < 1) {
-        show_message_box(nullptr,
-                         _("Can not found any WIFI device.\nPlease confim that you have a WIFI "
-                           "device (either built-in or USB WIFI)."));
-        return FALSE;
-    }
-    if (find_widget(ACTIVATE_BUTTON) != nullptr) {
-        set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
-        cb_refresh_network(nullptr, nullptr);
-    }
-    return FALSE;
 }

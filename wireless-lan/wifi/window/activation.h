@@ -9,7 +9,4 @@
 // interface is found, otherwise refreshes the list at once.
 void cb_active_device(GtkWidget *widget, gpointer data);
 
-// One-shot timer: looks for the interface again after the module was switched on.
-gboolean cb_check_wifi(gpointer data);
-
 #endif

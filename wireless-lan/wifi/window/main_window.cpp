@@ -63,7 +63,8 @@ GtkWidget *create_left_text()
     return scrolled;
 }
 
-void arrange_tree_view(GtkWidget *view)
+// Adds the five columns to a list view.
+static void arrange_tree_view(GtkWidget *view)
 {
     const char *const titles[] = {_("ESSID"), _("Mode"), _("KEY"), _("Signal strength"),
                                   _("State")};
@@ -75,7 +76,8 @@ void arrange_tree_view(GtkWidget *view)
                                                     renderer, "text", column, nullptr);
 }
 
-GtkTreeModel *create_model()
+// A new empty model of five text columns. The caller owns it.
+static GtkTreeModel *create_model()
 {
     return GTK_TREE_MODEL(gtk_list_store_new(5, G_TYPE_STRING, G_TYPE_STRING, G_TYPE_STRING,
                                              G_TYPE_STRING, G_TYPE_STRING));

@@ -11,12 +11,6 @@ GtkWidget *create_left_text();
 // The right half: status label, network list, Connect button.
 GtkWidget *create_list();
 
-// Adds the five columns to a list view.
-void arrange_tree_view(GtkWidget *view);
-
-// A new empty model of five text columns. The caller owns it.
-GtkTreeModel *create_model();
-
 // Makes the window, when it is first shown, as wide as the five columns with a connected row in
 // them need, where the screen has room. Both halves must be in it and shown.
 void set_default_width(GtkWindow *window);

@@ -29,31 +29,6 @@ static void show_no_device()
     debug_line("No interface");
 }
 
-gboolean cb_refresh_network(GtkWidget *, gpointer)
-{
-    debug_line("Searching...");
-    if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
-        hold_controls(HOLD_HOST);
-        set_title_label(_("Ad-Hoc Host Mode"));
-        return FALSE;
-    }
-
-    set_title_label(_("Searching..."));
-    get_interface();
-    printf("my_wifi->interface_count = %d\n", my_wifi->interface_count);
-    if (my_wifi->interface_count < 1) {
-        show_no_device();
-        return FALSE;
-    }
-
-    clear_network_list();
-    release_controls(HOLD_HOST);
-    hold_controls(HOLD_REFRESH);
-    set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
-    g_timeout_add(SCAN_DELAY_MS, cb_refresh, nullptr);
-    return FALSE;
-}
-
 // Sets connect_index to the last network whose access point is the one the interface is with, and
 // the status text that the list shows for it.
 static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize size)
@@ -86,7 +61,8 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
         copy_field(status, size, _("Disconnect"));
 }
 
-gboolean cb_refresh(gpointer)
+// One-shot timer: scans and fills the list. Always FALSE.
+static gboolean cb_refresh(gpointer)
 {
     WIFI_INTERFACE *iface = first_interface();
     char status[STATUS_TEXT_SIZE] = "";
@@ -121,5 +97,30 @@ gboolean cb_refresh(gpointer)
     match_access_point(iface, status, sizeof status);
     review_tree_vanpro(status);
     set_title_label(_("Wireless network selection"));
+    return FALSE;
+}
+
+gboolean cb_refresh_network(GtkWidget *, gpointer)
+{
+    debug_line("Searching...");
+    if (first_interface() != nullptr && first_interface()->wifi_group_enable) {
+        hold_controls(HOLD_HOST);
+        set_title_label(_("Ad-Hoc Host Mode"));
+        return FALSE;
+    }
+
+    set_title_label(_("Searching..."));
+    get_interface();
+    printf("my_wifi->interface_count = %d\n", my_wifi->interface_count);
+    if (my_wifi->interface_count < 1) {
+        show_no_device();
+        return FALSE;
+    }
+
+    clear_network_list();
+    release_controls(HOLD_HOST);
+    hold_controls(HOLD_REFRESH);
+    set_widget_sensitive(ACTIVATE_BUTTON, FALSE);
+    g_timeout_add(SCAN_DELAY_MS, cb_refresh, nullptr);
     return FALSE;
 }

@@ -8,7 +8,4 @@
 // "clicked" of the Refresh button; also called with two NULLs. Always FALSE.
 gboolean cb_refresh_network(GtkWidget *cb_widget, gpointer data);
 
-// One-shot timer: scans and fills the list. Always FALSE.
-gboolean cb_refresh(gpointer data);
-
 #endif
