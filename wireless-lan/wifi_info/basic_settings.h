@@ -19,11 +19,15 @@ gboolean save_basic_setting_to_file(const gchar *file);
 // file that does not exist is an empty one.
 gboolean get_basic_setting_from_file(const gchar *file);
 
-// Reads the addressing from a stanza that begins with "iface NAME inet METHOD" instead.
-gboolean get_basic_setting_from_file_Advanced(const gchar *file);
-
-// The two readers over an open stream, which stays open; a read error is its end.
+// The same from an open stream, which stays open; a read error is its end.
 void read_basic_settings(FILE *stream);
+
+// The general readers, which this program does not call: they are for files in the distributions'
+// own formats.
+
+// Reads the addressing from a stanza that begins with "iface NAME inet METHOD", as
+// get_basic_setting_from_file does.
+gboolean get_basic_setting_from_file_Advanced(const gchar *file);
 void read_basic_settings_advanced(FILE *stream);
 
 // The value of the first line of `file` that holds `var` and is no comment: the text behind its

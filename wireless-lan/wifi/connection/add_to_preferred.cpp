@@ -15,13 +15,15 @@ static void keep_network(const WIFI_CELL *cell, const gchar *alias)
 {
     g_autofree gchar *management = g_strdup_printf("%d", static_cast<int>(cell->key_mgmt));
     g_autofree gchar *index = g_strdup_printf("%d", static_cast<int>(cell->key_index));
-    const gchar *const ftext[LIST_COLUMNS] = {alias,
-                                              cell->essid,
-                                              client_mode(cell->mode),
-                                              encryption_word(ENC_OPEN, LIST_WORDS),
-                                              cell->userkey,
-                                              management,
-                                              index};
+    const gchar *const ftext[LIST_COLUMNS] = {
+        alias,
+        cell->essid,
+        client_mode(cell->mode),
+        encryption_word(ENC_OPEN, LIST_WORDS),
+        cell->userkey,
+        management,
+        index,
+    };
 
     if (append_user_cell_row(ftext))
         save_user_cell_clist();

@@ -26,7 +26,8 @@ void get_interface_statistics_data(WIFI_INTERFACE *iface);
 // is not taken for an answer of the new one.
 void clear_address(const char *name);
 
-// Prints the interface's line of /proc/net/wireless to standard error; a diagnostic.
+// Prints the interface's line of /proc/net/wireless to standard error. Nothing calls it: it is
+// there to be called while a driver is looked into.
 void get_network_statics(WIFI_INTERFACE *iface);
 
 #endif

@@ -50,8 +50,9 @@ static void append_record(const WIFI_CELL *cell, gboolean say)
     g_autofree gchar *key_mgmt_text = g_strdup_printf("%d", static_cast<int>(cell->key_mgmt));
     g_autofree gchar *key_index_text = g_strdup_printf("%d", static_cast<int>(cell->key_index));
     const gchar *const ftext[LIST_COLUMNS] = {
-        cell->alias,   cell->essid,   cell->mode,    encryption_word(cell->encmode, LIST_WORDS),
-        cell->userkey, key_mgmt_text, key_index_text};
+        cell->alias,   cell->essid,   cell->mode,     encryption_word(cell->encmode, LIST_WORDS),
+        cell->userkey, key_mgmt_text, key_index_text,
+    };
 
     if (say)
         printf("build_user_cell_clist, ftext[LIST_KEY_INDEX] = %s\n", ftext[LIST_KEY_INDEX]);
