@@ -16,6 +16,8 @@ HOME = Network("kitchen", "Home", wpa=1, enc="open", key="passphrase")
 CAFE = Network("cafe \udcff", index=3, enc="restricted", key="ab\udce9")
 DESK = Network("desk", "Office", mode="Ad-Hoc")
 FAILED = "The preferred networks could not be saved."
+QUESTION = ("{} could not be read whole.\nReplace it? The old file is kept beside it, with "
+            "\".old\" at the end of its name.")
 UNREADABLE = f"Could not access file: {FILE}\n"
 
 
@@ -95,7 +97,10 @@ def test_what_is_no_file(device, make):
     assert UNREADABLE in app.stderr()
     dialog = open_list(app)
     add(app, dialog, "first")
-    save_fails(app, dialog)
+    dialog.press("gtk-ok")
+    app.dialog(text=QUESTION.format(FILE)).press("gtk-yes")
+    close(app.dialog(text=FAILED), "gtk-ok")
+    dialog.wait_gone()
     assert os.path.islink(d.outer(FILE)) or os.path.isdir(d.outer(FILE))
     assert d.sh("ls /etc | grep -c '^.*wireless-user' || true").strip() == "1"
     # The program itself keeps the network until it ends.
@@ -159,7 +164,12 @@ def test_more_than_fit(device):
     networks = [Network(f"net {number}") for number in range(70)]
     d, app = start(device, *networks)
     assert names(app) == [f"net {number}" for number in range(64)]
-    close(open_list(app), "gtk-ok")
+    # The file holds more than the list, so it is kept.
+    old, dialog = d.file(FILE), open_list(app)
+    dialog.press("gtk-ok")
+    app.dialog(text=QUESTION.format(FILE)).press("gtk-yes")
+    dialog.wait_gone()
+    assert d.file(FILE + ".old") == old
     d.wait_file(FILE, file_of(*networks[:64]))
 
 

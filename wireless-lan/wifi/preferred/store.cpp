@@ -8,6 +8,7 @@
 #include "base/dialogs.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/unread_file.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/encryption.h"
@@ -18,6 +19,7 @@
 // them then.
 static GtkWidget *front_list = nullptr;
 static GtkWidget *backend_list = nullptr;
+static gboolean file_is_unread = FALSE; // it could not be read whole, and has not been replaced
 
 static guint32 number_value(const char *text)
 {
@@ -158,6 +160,11 @@ static void create_lists(gboolean say)
         append_record(my_wifi->user_wifi_cell[i], say);
 }
 
+void load_user_cells()
+{
+    file_is_unread = !get_preferred_network_setting_from_file(USER_FILE);
+}
+
 GtkWidget *build_user_cell_clist()
 {
     create_lists(TRUE);
@@ -167,6 +174,23 @@ GtkWidget *build_user_cell_clist()
 void rebuild_user_cell_clist()
 {
     create_lists(FALSE);
+}
+
+// Writes the file. One that could not be read whole holds networks that are not here: the user
+// decides, and is asked again at the next save after a No.
+static void write_records(GtkWidget *window)
+{
+    const unread_answer answer =
+        file_is_unread ? ask_to_replace(window, USER_FILE) : UNREAD_REPLACE;
+
+    if (answer == UNREAD_LEAVE)
+        return;
+    if (answer == UNREAD_REPLACE) {
+        file_is_unread = FALSE;
+        if (save_preferred_network_to_file(USER_FILE))
+            return;
+    }
+    show_message_box(window, _("The preferred networks could not be saved."));
 }
 
 void save_user_cell_clist()
@@ -179,13 +203,10 @@ void save_user_cell_clist()
         row_into_record(i, my_wifi->user_wifi_cell[i]);
     }
     my_wifi->user_cell_count = user_wifi_count;
-    if (save_preferred_network_to_file(USER_FILE))
-        return;
 
     GtkWidget *window = gtk_widget_get_toplevel(front_list);
 
-    show_message_box(GTK_IS_WINDOW(window) ? window : mainwindow,
-                     _("The preferred networks could not be saved."));
+    write_records(GTK_IS_WINDOW(window) ? window : mainwindow);
 }
 
 gboolean append_user_cell_row(const gchar *const ftext[LIST_COLUMNS])

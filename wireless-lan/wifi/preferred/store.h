@@ -21,6 +21,9 @@ enum list_column {
     LIST_COLUMNS
 };
 
+// Reads the records from the file, and remembers whether that was all of it.
+void load_user_cells();
+
 // Builds both lists from the records, registers them and returns the front list (one column: the
 // alias, or the name where it is empty, as valid UTF-8). Nothing is selected. The store owns both
 // lists; the former pair is destroyed.
@@ -32,8 +35,8 @@ void rebuild_user_cell_clist();
 // TRUE while both lists are registered; what follows works on lists that are.
 gboolean user_cell_lists_exist();
 
-// Copies the backend rows into the records and writes the file; tells the user when it could not be
-// written. Does nothing while a list is missing.
+// Copies the backend rows into the records and writes the file; asks the user first when it could
+// not be read whole, and tells when it could not be written. Does nothing while a list is missing.
 void save_user_cell_clist();
 
 // Appends one network to both lists and counts it; its row becomes user_cell_index. FALSE, with

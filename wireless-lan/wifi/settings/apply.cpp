@@ -12,6 +12,7 @@
 #include "base/network_list.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/unread_file.h"
 #include "connection/commands.h"
 #include "connection/interface_state.h"
 #include "connection/monitor.h"
@@ -113,6 +114,25 @@ static gboolean enter_selection_mode()
     return TRUE;
 }
 
+static gboolean file_is_unread = FALSE; // it could not be read whole, and has not been replaced
+
+void load_settings()
+{
+    file_is_unread = !get_basic_setting_from_file(SETTINGS_FILE);
+}
+
+// FALSE when they could not be written; a user who wants to keep the old file has decided so.
+static gboolean write_settings(GtkWidget *dialog)
+{
+    const unread_answer answer =
+        file_is_unread ? ask_to_replace(dialog, SETTINGS_FILE) : UNREAD_REPLACE;
+
+    if (answer == UNREAD_REPLACE)
+        file_is_unread = FALSE;
+    return answer == UNREAD_LEAVE ||
+           (answer == UNREAD_REPLACE && save_basic_setting_to_file(SETTINGS_FILE));
+}
+
 int Save_Basic_Setting(GtkWidget *dialog)
 {
     WIFI_INTERFACE *iface = first_interface();
@@ -124,9 +144,8 @@ int Save_Basic_Setting(GtkWidget *dialog)
     take_check_state("auto_dns", iface, &iface->auto_dns);
     take_check_state("adhoc-host", iface, &iface->wifi_group_enable);
 
-    // What cannot be stored is applied all the same: it holds until the device is switched off.
-    if (!interface_usable(iface->name, "saving the settings") ||
-        !save_basic_setting_to_file(SETTINGS_FILE))
+    // What is not stored is applied all the same: it holds until the device is switched off.
+    if (!interface_usable(iface->name, "saving the settings") || !write_settings(dialog))
         show_message_box(dialog, _("The settings could not be saved."));
 
     if (iface->wifi_group_enable)

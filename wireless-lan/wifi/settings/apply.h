@@ -23,6 +23,9 @@ gchar *settings_key(const char *prefix, const char *iface_name);
 // interface had when it opened.
 GtkWidget *find_settings_widget(const char *prefix, const char *iface_name);
 
+// Reads the settings from their file, and remembers whether that was all of it.
+void load_settings();
+
 // Takes over what the settings dialog shows. 0: a value was refused, with a message over `dialog`,
 // and nothing was written; 1: done.
 int Save_Basic_Setting(GtkWidget *dialog);

@@ -10,7 +10,6 @@
 #include "settings/adhoc_dialog.h"
 #include "settings/apply.h"
 #include "wifi.h"
-#include "wifi_info/basic_settings.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
 #include "wifi_info/text.h"
@@ -202,7 +201,7 @@ void cb_wifi_settings(GtkWidget *, gpointer)
         debug_line("No interface");
         return;
     }
-    get_basic_setting_from_file(SETTINGS_FILE);
+    load_settings();
 
     GtkWidget *dialog = begin_dialog(create_settings_dialog(first_interface()));
 

@@ -2,11 +2,10 @@
 
 #include "base/state.h"
 #include "preferred/store.h"
+#include "settings/apply.h"
 #include "wifi.h"
-#include "wifi_info/basic_settings.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/interfaces.h"
-#include "wifi_info/preferred_file.h"
 #include "wifi_info/shell.h"
 
 void load_configuration()
@@ -16,7 +15,7 @@ void load_configuration()
         bring_interface_up(first_interface()->name);
         debug_line("find a wifi device,up it");
     }
-    get_basic_setting_from_file(SETTINGS_FILE);
-    get_preferred_network_setting_from_file(USER_FILE);
+    load_settings();
+    load_user_cells();
     global_build_list = build_user_cell_clist();
 }
