@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Floor: an empty GTK+ 2 window.
 
 #include <gtk/gtk.h>

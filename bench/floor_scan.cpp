@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "floor_scan.h"
 
 #include <cstdio>

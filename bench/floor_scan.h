@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The least that a refresh can do: read the two pipes, put the rows in.
 
 #ifndef BENCH_FLOOR_SCAN_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The widgets of the main window and nothing else, written straight down.
 
 #ifndef BENCH_FLOOR_WINDOW_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Times the refill of a shown list from scan records, the drawing included: the program's own, or
 // the floor's.
 //

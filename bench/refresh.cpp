@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Floor: the main window's widgets, the two helper processes of start-up, and after the first
 // picture one discovery, the 100 ms pause, the scan and its rows.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Times get_cell against a plain pipe that reads the same lines and drops them, in turns.
 //
 //   scan_cost ROUNDS

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Starts a program and watches from outside what it draws.
 //
 //   watch LOG PROGRAM [ARGUMENT...]

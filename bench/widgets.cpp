@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Floor: the main window's widgets, no logic.
 
 #include "floor_window.h"

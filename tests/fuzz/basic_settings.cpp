@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The basic settings: read over flags that the first byte chooses, written and read again.
 
 #include "wifi_info/basic_settings.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The settings in the other form.
 
 #include "fuzz.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A text in a field of the size that the first byte gives, and once more from inside the field.
 
 #include "fuzz.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The two value extractors: the first byte chooses `unit`, the first line is the keyword.
 
 #include "fuzz.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A variable out of a file: the first line is the variable, the rest the file. The same input as a
 // parameter line.
 

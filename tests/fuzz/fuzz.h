@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the fuzz targets share: an input as a stream or a file, and a check that ends the run.
 
 #ifndef TESTS_FUZZ_FUZZ_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The kernel's list of wireless interfaces.
 
 #include "wifi_info/interfaces.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The preferred networks: read, written and read again.
 
 #include "wifi_info/preferred_file.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Runs a fuzz target over every file of the folders given: the corpus as a plain test.
 
 #include <glib.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The output of iwlist, read twice over: the second scan releases the records of the first.
 
 #include "wifi_info/scan.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Text inside command lines: a shell makes one word of it, the same text.
 
 #include "wifi_info/shell.h"

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What stands in for the outside world in the unit tests. They are linked with --wrap=system and
 // its like: system() only notes its command line, popen() notes it and starts the real shell, which
 // finds our own `cat` and `iwlist` first.

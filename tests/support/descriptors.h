@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Descriptors of the test itself, for those that must not leave one behind.
 
 #ifndef TESTS_CONNECTION_DESCRIPTORS_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "goldens.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The inputs of tests/goldens with the records that stand beside them.
 
 #ifndef TESTS_SUPPORT_GOLDENS_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the readers should make of a text, worked out a second time: from whole lists of lines and
 // pieces of std::string instead of from a stream, so that the two agree only where both are right.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Texts for generated records: empty ones, full ones, blanks, line ends, bytes that are no UTF-8.
 
 #ifndef TESTS_SUPPORT_RANDOM_TEXT_H

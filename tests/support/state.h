@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A state record for tests, and its fields as texts.
 
 #ifndef TESTS_SUPPORT_STATE_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What counts as an IPv4 address in the settings dialog.
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The key dialog's combos before the preferred lists exist; no display is needed to say no.
 
 #include <string>

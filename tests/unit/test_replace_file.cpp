@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Kills, full disks, mounts and foreign owners: tests/save/.
 
 #include <gtest/gtest.h>

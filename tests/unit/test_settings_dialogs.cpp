@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialogs of the settings from inside the program: what no hand at the device can bring about
 // or see.
 
