@@ -113,11 +113,11 @@ class Device:
         """Starts it, and waits for its window. `device_path`: the program as it is built for a
         device that has a directory of commands, /usr/lib/wireless-lan/device."""
         number = len(self.apps)
-        program = os.path.abspath(os.environ.get(
-            "WIRELESS_LAN", f"{TOP}/build/wireless-lan/wireless-lan"))
+        build = os.path.abspath(os.environ.get("WIRELESS_LAN_BUILD", f"{TOP}/build"))
+        program = os.path.abspath(os.environ.get("WIRELESS_LAN",
+                                                 f"{build}/wireless-lan/wireless-lan"))
         if device_path:
-            program = os.path.abspath(os.environ.get("WIRELESS_LAN_BUILD", f"{TOP}/build") +
-                                      "/tests/with-device-path")
+            program = f"{build}/tests/with-device-path"
         assert os.path.exists(program), f"{program} is not built"
         settings = {
             "DISPLAY": self.display.name, "HOME": "/device/state/home", "LANG": "C.UTF-8",
