@@ -305,17 +305,17 @@ class Program(Pane):
 
     def _connect(self):
         def attempt():
-            self._socket = socket.socket(socket.AF_UNIX)
-            self._socket.settimeout(120)
+            connection = socket.socket(socket.AF_UNIX)
+            connection.settimeout(120)
             try:
-                self._socket.connect(self._path)
-                return True
+                connection.connect(self._path)
+                return connection
             except OSError:
-                self._socket.close()
+                connection.close()
                 assert self._process.poll() is None, self._ended()
-                return False
+                return None
 
-        wait_until(attempt, lambda: "the program to answer\n" + self.said(), 60)
+        self._socket = wait_until(attempt, lambda: "the program to answer\n" + self.said(), 60)
         self._stream = self._socket.makefile("rb")
 
     def windows(self):
