@@ -1,6 +1,7 @@
 #include "wifi_info/text.h"
 
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 #include <initializer_list>
 

@@ -10,7 +10,6 @@
 #include "base/registry.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
-#include "wifi_info/text.h"
 
 // WPA has no Ad-Hoc mode, no key state and no key index here; its key state counts as "open".
 static void follow_key_mgmt(const network_form &form, gboolean wpa)
