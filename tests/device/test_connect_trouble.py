@@ -5,6 +5,8 @@ import os
 import resource
 import subprocess
 
+import pytest
+
 from connecting import (ACQUIRING, COMMANDS, CONNECTING, IDLE, INVALID, LOCKED, address_of, arrive,
                         children, connect, connected, idle, pass_time, poll_address, poll_link,
                         refresh, settle, wait_commands)
@@ -229,3 +231,58 @@ def test_interface_names_that_no_kernel_gives(device):
     d.set_interfaces("wlan0")
     connect(app, 0)
     wait_commands(d, app)
+
+
+@pytest.mark.parametrize("name", ["essid_tmp", "key_tmp"])
+def test_a_name_in_tmp_that_cannot_be_had(device, name):
+    """Name and key belong together: both files are ours, or neither is there and nothing is told."""
+    d, app = idle(device, "cafe", "bar")
+    d.sh(f"echo old >/tmp/essid_tmp; echo old >/tmp/key_tmp; rm /tmp/{name}; mkdir /tmp/{name}")
+    connect(app, 0)
+    app.wait_title(CONNECTING)
+    pass_time(d, app, 100)
+    box = app.dialog(text="The name and the key cannot be left in /tmp for the device.\n"
+                          "The network is not set up.")
+    app.wait_printed(f"WIRELESS-LAN-DEBUG: /tmp/{name} is not written: File exists\n")
+    box.press("gtk-close")
+    box.wait_gone()
+    assert d.commands("iwset") == []
+    assert d.sh("ls /tmp | grep _tmp || true").split() == [name]
+    assert [row[4] for row in app.networks()] == ["Not Connect", "Disconnect"]
+    assert settle(app) == IDLE and all(app.sensitive(key) for key in LOCKED)
+    # Hosting needs the name alone.
+    app.press("button-wifi-settings")
+    dialog = app.dialog("WLAN Setting")
+    dialog.click("adhoc-hostwlan0")
+    dialog.press("gtk-ok")
+    if name == "essid_tmp":
+        app.dialog(text="The name and the key cannot be left in /tmp for the device.\n"
+                        "The network is not set up.").press("gtk-close")
+    dialog.wait_gone()
+    assert settle(app) == "Ad-Hoc Host Mode"
+    assert len(d.commands("iwset")) == (0 if name == "essid_tmp" else 1)
+
+
+def test_control_characters(device):
+    """They stay in the record and the command; a line has none, in /tmp and in diagnostics."""
+    name, key = "a\x1b[2J\x07b", "one\ntwo"
+    d, app = idle(device, (name, "on"))
+    connect(app, 0)
+    dialog = app.dialog("Encrypted Network")
+    dialog.type("connect_key", key)
+    dialog.press("gtk-ok")
+    app.dialog(text="Do you want to add this configuration to the preferred network?").press(
+        "gtk-no")
+    wait_commands(d, app)
+    assert d.commands("iwset")[0].argv[3:8] == [name, "mode", "Managed", "key", key]
+    assert d.file("/tmp/essid_tmp") == name.encode() + b"\n"
+    assert d.file("/tmp/key_tmp") == b"one two\n"
+    shown = r"a\x1b[2J\x07b"
+    assert f"WIRELESS-LAN-DEBUG: ESSID:{shown}\n" in app.stderr()
+    assert f"WIRELESS-LAN-DEBUG: essid to set:{shown}\n" in app.stderr()
+    assert (f'iwset cmd=/sbin/iwset "wlan0" essid "{shown}" mode "Managed" key "one\\x0atwo" '
+            'enc "open" "[1]"\r\n') in app.stdout()
+    arrive(d, app, 0)
+    refresh(d, app)
+    app.wait_printed(f"matched connect info:state [1],essid:[{shown}]")
+    assert not set(app.stdout() + app.stderr()) & set(map(chr, [*range(9), 11, 12, *range(14, 32)]))

@@ -1,7 +1,9 @@
+#include <cerrno>
 // SPDX-License-Identifier: MIT
 #include <cstring>
 #include <string>
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -124,6 +126,21 @@ TEST(IwsetCommand, IsNeverCut)
     EXPECT_EQ(command.substr(command.size() - 5), "\"[1]\"");
 }
 
+// Another user, who makes a file of this name right before we can, so many times.
+static std::string intruder;
+static int intrusions = 0;
+
+extern "C" int mknod(const char *path, mode_t mode, dev_t device)
+{
+    if (intruder == path && intrusions > 0) {
+        intrusions--;
+        EXPECT_TRUE(g_file_set_contents(path, "theirs", -1, nullptr));
+        errno = EEXIST;
+        return -1;
+    }
+    return mknodat(AT_FDCWD, path, mode, device);
+}
+
 struct LeaveText : testing::Test {
     std::string folder, path;
 
@@ -194,6 +211,31 @@ TEST_F(LeaveText, DoesNotFollowALinkToNowhere)
     leave_text_for_scripts("secret", path.c_str(), 0600);
     EXPECT_NE(access(target.c_str(), F_OK), 0);
     EXPECT_EQ(content(path), "secret\n");
+}
+
+TEST_F(LeaveText, RemovesWhatAnotherUserMakesAgain)
+{
+    for (const int times : {1, 99, 100}) {
+        intruder = path;
+        intrusions = times;
+        testing::internal::CaptureStderr();
+        EXPECT_EQ(leave_text_for_scripts("secret", path.c_str(), 0600), times < 100);
+
+        const std::string said = testing::internal::GetCapturedStderr();
+
+        EXPECT_EQ(intrusions, 0);
+        EXPECT_EQ(content(path), times < 100 ? "secret\n" : "theirs");
+        EXPECT_EQ(said, times < 100
+                            ? ""
+                            : "WIRELESS-LAN-DEBUG: " + path + " is not written: File exists\n");
+        intruder.clear();
+    }
+}
+
+TEST_F(LeaveText, IsOneLine)
+{
+    EXPECT_TRUE(leave_text_for_scripts("a\nb\r\nc", path.c_str(), 0600));
+    EXPECT_EQ(content(path), "a b  c\n");
 }
 
 TEST_F(LeaveText, SaysWhyAFileCannotBeMade)

@@ -34,6 +34,24 @@ static void end_without_network()
     give_controls_back();
 }
 
+// Without the files for the device's scripts /sbin/iwset would join with the name and key of
+// another.
+static void end_without_files()
+{
+    review_tree_vanpro(_("Not Connect"));
+
+    WIFI_CELL *cell = scanned_cell(connect_index);
+
+    if (cell != nullptr)
+        cell->linkstate = 2;
+    if (!controls_held(HOLD_REFRESH | HOLD_HOST))
+        set_title_label(_("Wireless network selection"));
+    give_controls_back();
+    show_warring_dialog(mainwindow,
+                        _("The name and the key cannot be left in /tmp for the device.\n"
+                          "The network is not set up."));
+}
+
 static void show_connecting()
 {
     connect_button_sensitive(FALSE);
@@ -60,8 +78,10 @@ static gboolean do_connect(gpointer data)
         if (!controls_held(HOLD_CONNECT))
             show_connecting();
     }
-    apply_configuration();
-    g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
+    if (apply_configuration())
+        g_timeout_add(POLL_MS, detect_network_link_state, nullptr);
+    else
+        end_without_files();
     return FALSE;
 }
 

@@ -88,7 +88,10 @@ static void take_check_state(const char *prefix, const WIFI_INTERFACE *iface, gb
 
 static void enter_host_mode(const WIFI_INTERFACE *iface)
 {
-    host_network(iface);
+    if (!host_network(iface))
+        show_warring_dialog(mainwindow,
+                            _("The name and the key cannot be left in /tmp for the device.\n"
+                              "The network is not set up."));
     hold_controls(HOLD_HOST);
     set_title_label(_("Ad-Hoc Host Mode"));
     send_status_to_desktop(STATUS_ASSOCIATED);
