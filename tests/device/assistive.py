@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """The hands of assistive technology: it presses a button of the main window through its accessible
 action, which a dialog in front does not keep away as it does the pointer."""
 

@@ -1,10 +1,11 @@
+# SPDX-License-Identifier: MIT
 """Records that change under an open dialog, a scheduled connect or a poller.
 
 A dialog keeps the pointer away from the main window, not a screen reader's press on Refresh."""
 
 import assistive
-from connecting import (CONNECTING, HIDDEN, IDLE, LOCKED, OFFER, address_of, connect, connected, idle,
-                        pass_time, poll_link, preferred, settle, type_answer, wait_commands)
+from connecting import (CONNECTING, HIDDEN, IDLE, LOCKED, OFFER, address_of, connect, connected,
+                        idle, pass_time, poll_link, preferred, settle, type_answer, wait_commands)
 from harness import wait_until
 
 MARKER = {"/etc/build_in_wifi": b""}

@@ -1,21 +1,24 @@
+# SPDX-License-Identifier: MIT
 """What is pending when something else is pressed, and how both end.
 
-The sources that can be pending, and what a person can press while each is:
+The sources that can be pending, and what a person can press while each is. Start-up jobs run before
+a press is heard; rows connect nothing during a check, and Active WIFI does nothing then:
 
 | Source                           | begun by                        | can be pressed meanwhile   |
 |----------------------------------|---------------------------------|----------------------------|
-| start-up jobs (idle)             | the first sight of the window   | nothing: they run before a press is heard |
+| start-up jobs (idle)             | the first sight of the window   | nothing                    |
 | scan, 100 ms                     | Refresh, start-up, Active WIFI  | nothing                    |
-| check, 6050 ms                   | Active WIFI without a device    | rows (they connect nothing), Active WIFI (does nothing) |
-| connect, 100 ms                  | Connect, a double click         | rows; Active WIFI when the device has gone |
+| check, 6050 ms                   | Active WIFI without a device    | rows, Active WIFI          |
+| connect, 100 ms                  | Connect, a double click         | rows; Active WIFI when     |
+|                                  |                                 | the device has gone        |
 | link poller, 2000 ms             | the connect                     | the same                   |
 | address poller, 2000 ms          | the link poller                 | the same                   |
 | disconnect, 100 ms               | Connect on the connected row    | everything                 |
 | follower of the settings, 4000 ms| OK in the settings              | everything                 |
 
 Every press is tried on every source. Where it can be made it comes twice: so that what it begins
-ends first, and so that the pending source does. Behind both, when nothing is pending any more, rows,
-title, controls and commands must agree."""
+ends first, and so that the pending source does. After both, when nothing is pending any more,
+rows, title, controls and commands must agree."""
 
 import pytest
 

@@ -1,3 +1,4 @@
+# SPDX-License-Identifier: MIT
 """Files that could not be read whole are not written over without asking."""
 
 import subprocess

@@ -99,7 +99,8 @@ def test_first_settings_are_written():
     """What the settings dialog shows on a fresh board: its own first file would be refused."""
     assert client_dns(None) == (0, [b"auto"])
     assert read("/etc/wireless.conf") == (
-        b"iface wlan0\naddrtype dhcp\ndns auto\nwifigroup 0\nESSID \nMODE Ad-Hoc\nKEY \nEncryption off\n")
+        b"iface wlan0\naddrtype dhcp\ndns auto\nwifigroup 0\n"
+        b"ESSID \nMODE Ad-Hoc\nKEY \nEncryption off\n")
     assert os.stat("/etc/wireless.conf").st_mode & 0o777 == 0o600
     settings("mine")
     client_dns("mine")
