@@ -156,11 +156,12 @@ class Recorder:
     def keep(self, *words):
         """One more file: what the tool prints, if it prints a network."""
         def answered():
-            done = subprocess.run([*self.tool, "dev", STATION, "scan", *words],
-                                  stdout=subprocess.PIPE, stderr=subprocess.STDOUT)
+            # A scan whose end the kernel does not tell is asked for again.
+            done = subprocess.run(["timeout", "20", *self.tool, "dev", STATION, "scan", *words],
+                                  stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
             self.text = done.stdout
             return done.returncode == 0
-        wait_until(answered, lambda: f"scan {words}: {self.text}", 30)
+        wait_until(answered, lambda: f"scan {words}: {self.text}", 60)
         if b"BSS " not in self.text:
             return
         self.number += 1
