@@ -250,3 +250,23 @@ def test_error_of_a_card_that_is_none():
     note("scan-error", text)
     assert run("iwlist", "lo", "scan") == (255, b"", text)
     assert calls("iw") == []
+
+
+def test_where_busybox_is_the_only_userland():
+    wrap = machine.in_busybox()
+    note("iw-scan", read(GOLDENS[0]))
+    status, out, err = run("iwlist", "wlan0", "scan", wrap=wrap)
+    assert (status, err) == (0, b"")
+    assert [board.name_bytes(one["essid"]) for one in board.networks(out)] == [
+        one["name"] for one in read_iw(read(GOLDENS[0]))]
+    choose("iwlist")
+    note("scan", answer([(address_of(1), b"\xff" * 32)]))
+    out = run("iwlist", "wlan0", "scan", wrap=wrap)[1]
+    assert board.name_bytes(board.networks(out)[0]["essid"]) == b"\xff" * 32
+    choose("iw")
+    note("iw-link", "Connected to 02:00:00:00:0a:00 (on wlan0)\n")
+    assert run("ap-address", "wlan0", wrap=wrap) == (0, b"02:00:00:00:0a:00\n", b"")
+    choose("cat")
+    note("wireless")
+    out = run("cat", "/proc/net/wireless", wrap=wrap)[1]
+    assert board.interfaces(out) == [b"wlan0"]
