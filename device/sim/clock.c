@@ -15,7 +15,8 @@
 #include <time.h>
 #include <unistd.h>
 
-// Layout shared with tests/device/harness/clock.py. An odd sequence number: being written.
+// The layout is shared with tests/device/harness/clock.py. The sequence number is odd while the
+// page is being written.
 struct page {
     uint32_t sequence;
     uint32_t unused;
@@ -24,13 +25,13 @@ struct page {
     double rate;
 };
 
-// How long a wait goes without looking at the page again.
+// The longest wait before the page is read again.
 #define SLICE_NS 2000000
 
 static const volatile struct page *page;
 
-// How far these clocks are ahead of the monotonic one. Measured once: a distance that is measured
-// anew at every look is a little different each time, and a clock at rest would tremble.
+// How far these clocks are ahead of the monotonic one. It is measured once: measured at every call
+// it would differ a little each time, and a stopped clock would move.
 static int64_t real_ahead, boot_ahead;
 
 // The system call itself: a name looked up in the next library may lead back here.

@@ -1,17 +1,17 @@
 // SPDX-License-Identifier: MIT
 // Every command of the simulated device: iwset, lnk-ifup, lnk-ifdown, ifconfig, iwlist, cat.
 //
-// One program under all the names. It writes down how it was called, waits, runs the scenario's
-// hook, prints what the state directory holds for it, and ends with the exit status that is
-// there. Files of the state directory, each of them optional and read anew on every call:
+// One program has all the names. It logs how it was called, waits, runs the hook, prints what the
+// state directory holds for it, and exits with the status from there. Each of these files of the
+// state directory is optional and read at every call:
 //
 //   NAME.delay   seconds to wait first       hooks/NAME   program to run next, same arguments
 //   NAME.stdout  text for standard output    NAME.stderr  text for standard error
 //   NAME.exit    exit status                 scan         what "iwlist IF scan" prints
 //   wireless     what "cat /proc/net/wireless" prints
 //
-// The log is one JSON object a line, each written at once: "start" with the arguments, "end" with
-// the status and the parent at that time. Bytes are written as the characters U+0000 to U+00FF.
+// The log has one JSON object a line, each written by one call: "start" with the arguments, "end"
+// with the status and the parent at that time. A byte is written as a character, U+0000 to U+00FF.
 #define _GNU_SOURCE
 #include <errno.h>
 #include <fcntl.h>

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// First process of the simulated device: starts one program, takes in every process that lost its
-// parent, and leaves with the program's exit status. The rest of the namespace ends with it.
+// The first process of the simulated device: starts one program, reaps every process that lost its
+// parent, and exits with the program's status. The rest of the namespace ends with it.
 #include <errno.h>
 #include <signal.h>
 #include <stdio.h>
@@ -22,7 +22,7 @@ int main(int argc, char **argv)
         fprintf(stderr, "%s: %s\n", argv[1], strerror(errno));
         _exit(127);
     }
-    // ^C is for the program; it decides.
+    // The program decides what Ctrl+C means.
     signal(SIGINT, SIG_IGN);
     while ((ended = wait(&status)) > 0 || (ended < 0 && errno == EINTR))
         if (ended == program)

@@ -262,7 +262,7 @@ def test_failed_write_is_told(app):
     before = dhcp(essid="board")
     settings = Settings(app, before)
     settings.toggle("adhoc-host")
-    # Neither the file nor its directory takes a byte.
+    # Neither the file nor its directory can be written.
     device.sh("mount --bind /etc /etc && mount -o remount,ro,bind /etc")
     at = mark(app)
     try:
