@@ -4,6 +4,7 @@
 import os
 import subprocess
 
+import assistive
 from harness import wait_until
 
 from preferred import (ADD, BACKEND, DELETE, FILE, FRONT, LIST, PROPERTIES, Network, change, close,
@@ -332,3 +333,53 @@ def test_long_list_stays_in_sight(device):
     app.key("space")
     wait_until(lambda: dialog.selected(FRONT) == [5], "the sixth row")
     close(dialog, "gtk-cancel")
+
+
+def test_resizing_leaves_the_view_where_it_is(device):
+    d, app = start(device, *[Network(f"net {number}") for number in range(40)])
+    dialog = open_list(app)
+
+    def edges():
+        """How far the list reaches over the upper and the lower edge of the view, whose own shadow
+        has two pixels."""
+        front = dialog.find(FRONT)
+        _, top, _, height = front.parent["rect"]
+        return (top + 2 - front["rect"][1],
+                front["rect"][1] + front["rect"][3] - (top + height - 2))
+
+    select(dialog, 39)
+    wait_until(lambda: edges()[1] == 0, lambda: f"the last row as a whole; {edges()}")
+    select(dialog, 0)
+    wait_until(lambda: edges()[0] == 0, lambda: f"the first row; {edges()}")
+    left, top, width, height = dialog.find(FRONT).parent["rect"]
+    d.display.click(left + width // 2, top + height // 2, 5, count=30)
+    wait_until(lambda: edges()[1] == 0, lambda: f"the end; {edges()}")
+    window = d.display._window(d.display.root, LIST)
+    for change in (-40, 30):
+        before = dialog.tree()["rect"]
+        window.configure(height=before[3] + change)
+        d.display._x.sync()
+        wait_until(lambda: dialog.tree()["rect"][3] != before[3], "the new height")
+        assert edges()[0] > height, edges()
+
+
+def test_a_row_that_has_gone_meanwhile(device):
+    """Two questions for one row, the second by assistive technology: one network is deleted."""
+    d = device("street", files={**assistive.settings()["files"], FILE: file_of(HOME, CAFE)})
+    app = d.start(environment=assistive.settings()["environment"])
+    app.wait_listed()
+    dialog = open_list(app)
+    select(dialog, 1)
+    dialog.press("preferred_button_delete")
+    app.dialog(DELETE)
+    assistive.press(d, "preferred_button_delete")
+    wait_until(lambda: len([one for one in app.dialogs() if one[0] == DELETE]) == 2, "two")
+    for left in (1, 0):
+        wait_until(lambda: any(one["active"] for one in app.windows() if one["title"] == DELETE),
+                   "the question in front")
+        app.key("alt+o")
+        wait_until(lambda: len([one for one in app.dialogs() if one[0] == DELETE]) == left,
+                   "a question to go")
+    assert names(app) == ["Home"]
+    close(dialog, "gtk-ok")
+    d.wait_file(FILE, file_of(HOME))

@@ -57,7 +57,9 @@ void cb_configuration_delete(GtkWidget *, gpointer data)
         begin_dialog(create_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
 
     gtk_widget_show_all(dialog);
-    if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist())
+    // Looked up afresh: rows can go while the question stands.
+    if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
+        row < user_wifi_count)
         delete_network(row);
     end_dialog(dialog);
 }

@@ -17,10 +17,11 @@ static void reveal_row(GtkWidget *front, gint row)
 {
     GtkWidget *viewport = gtk_widget_get_parent(front);
     const gint height = GTK_CLIST(front)->row_height + 1; // with the line between two rows
+    const gint borders = 2 * front->style->ythickness;    // above the first row and below the last
 
     if (row >= 0 && GTK_IS_VIEWPORT(viewport))
         gtk_adjustment_clamp_page(gtk_viewport_get_vadjustment(GTK_VIEWPORT(viewport)),
-                                  row * height, (row + 1) * height + 1);
+                                  row * height, (row + 1) * height + 1 + borders);
 }
 
 static void reveal_selected()
@@ -31,9 +32,27 @@ static void reveal_selected()
         reveal_row(front, my_wifi->user_cell_index);
 }
 
-static void cb_reveal_focus(GtkWidget *front)
+static void cb_reveal_selected(GtkWidget *, gint, gint, GdkEventButton *, gpointer)
+{
+    reveal_selected();
+}
+
+static void cb_reveal_focus(GtkWidget *front, GtkScrollType, gfloat, gpointer)
 {
     reveal_row(front, GTK_CLIST(front)->focus_row);
+}
+
+// "changed" of the range that is scrolled over: a row that was just added can be reached once the
+// list has grown. A window that is only resized leaves the view where it is.
+static void cb_range_changed(GtkAdjustment *range, gpointer)
+{
+    static gdouble former = 0;
+    const gdouble height = gtk_adjustment_get_upper(range);
+    const gboolean grown = height > former && height > gtk_adjustment_get_page_size(range);
+
+    former = height;
+    if (grown)
+        reveal_selected();
 }
 
 static void move_selected(gint step)
@@ -62,15 +81,14 @@ static GtkWidget *create_front_window()
     GtkWidget *window = gtk_scrolled_window_new(nullptr, nullptr);
     GtkWidget *front = build_user_cell_clist();
 
-    g_signal_connect_after(front, "select-row", G_CALLBACK(reveal_selected), nullptr);
+    g_signal_connect_after(front, "select-row", G_CALLBACK(cb_reveal_selected), nullptr);
     g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_reveal_focus), nullptr);
     gtk_container_set_border_width(GTK_CONTAINER(window), 5);
     gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(window), GTK_POLICY_AUTOMATIC,
                                    GTK_POLICY_AUTOMATIC);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(window), front);
-    // A row that was just added can be scrolled to once the list has grown.
     g_signal_connect(gtk_scrolled_window_get_vadjustment(GTK_SCROLLED_WINDOW(window)), "changed",
-                     G_CALLBACK(reveal_selected), nullptr);
+                     G_CALLBACK(cb_range_changed), nullptr);
     return window;
 }
 

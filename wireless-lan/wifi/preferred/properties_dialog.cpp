@@ -93,7 +93,9 @@ void cb_configuration_properties(GtkWidget *, gpointer data)
     connect_network_form(form);
     choose_key_mgmt(row);
     gtk_widget_show_all(dialog);
-    while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && !store_network(row, dialog)) {
+    // Looked up afresh: rows can go while the form stands.
+    while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
+           row < user_wifi_count && !store_network(row, dialog)) {
     }
     end_dialog(dialog);
 }
