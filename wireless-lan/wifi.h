@@ -91,8 +91,8 @@ struct _MY_WIFI {
 };
 typedef struct _MY_WIFI MY_WIFI;
 
-// The records come from g_malloc0 and are copied as bytes; outside programs' headers of the same
-// records fix order and width.
+// The records come from g_malloc0 and are copied as bytes. Field order and widths are part of the
+// format.
 static_assert(std::is_trivial<MY_WIFI>::value && std::is_standard_layout<MY_WIFI>::value);
 static_assert(std::is_trivial<WIFI_INTERFACE>::value && std::is_trivial<WIFI_CELL>::value);
 static_assert(sizeof(t_wifimode) == 4 && sizeof(gboolean) == 4);

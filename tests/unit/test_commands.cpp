@@ -1,5 +1,5 @@
-#include <cerrno>
 // SPDX-License-Identifier: MIT
+#include <cerrno>
 #include <cstring>
 #include <string>
 

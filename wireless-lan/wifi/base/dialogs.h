@@ -16,8 +16,9 @@ void show_warring_dialog(GtkWidget *parent, const gchar *message);
 // The same with a second, smaller text below the first; NULL: none.
 void show_explained_warning(GtkWidget *parent, const gchar *message, const gchar *explanation);
 
-// Runs `dialog` as gtk_dialog_run does. The caller keeps the dialog until end_dialog, even when it
-// is destroyed meanwhile with its parent; the answer is then GTK_RESPONSE_NONE.
+// Holds `dialog` until end_dialog, even when it is destroyed meanwhile with its parent:
+// gtk_dialog_run answers GTK_RESPONSE_NONE then, and the dialog can still be looked at. end_dialog
+// destroys it.
 GtkWidget *begin_dialog(GtkWidget *dialog);
 void end_dialog(GtkWidget *dialog);
 

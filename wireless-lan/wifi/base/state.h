@@ -8,13 +8,13 @@
 #include "wifi.h"
 
 extern GtkWidget *mainwindow; // set by main; NULL before and after its life
-extern gint connect_index;    // network the interface is with, -1: none; refresh, flow, commands
-extern gint pid_dhclient;     // kept for readers of the state, nothing sets it
-extern gboolean linkconnect;  // written by the link poller
-extern gboolean addressvalid; // kept for readers of the state, nothing sets it
-extern gboolean doubleclick;  // a double click may connect; written by flow and the pollers
-extern gint user_wifi_count;  // rows of the preferred lists; written by the preferred rooms
-extern GtkWidget *global_build_list; // the front list of start-up; written by start_up
+extern gint connect_index; // network the interface is with, -1: none; refresh, flow, chosen_network
+extern gint pid_dhclient;  // part of the state model, nothing sets it
+extern gboolean linkconnect;         // written by the link poller
+extern gboolean addressvalid;        // part of the state model, nothing sets it
+extern gboolean doubleclick;         // a double click may connect; written by flow and the pollers
+extern gint user_wifi_count;         // rows of the preferred lists; written by the preferred rooms
+extern GtkWidget *global_build_list; // the front list of start-up; written by start_up, store
 extern gint boxspacing;              // padding of the settings' address rows, pixels
 
 // Creates the zeroed state record with nothing selected. FALSE when memory is refused.

@@ -41,7 +41,7 @@ static GtkWidget *backend_list()
     return backend;
 }
 
-// What the combo builders return without the preferred lists: readers of the state know it.
+// What the combo builders return without the preferred lists.
 static GtkWidget *invalid_widget()
 {
     return static_cast<GtkWidget *>(GINT_TO_POINTER(1));
