@@ -45,9 +45,9 @@ read_choice() {
     esac
 }
 
-# ask WORD: one answer of our supplicant.
+# ask WORD...: one answer of our supplicant.
 ask() {
-    wpa_cli -p "$state/control" -i "$interface" "$1" 2>/dev/null
+    limited 2 wpa_cli -p "$state/control" -i "$interface" "$@" 2>/dev/null
 }
 
 # is_joined: whether our supplicant is in a network; sets network to its number.

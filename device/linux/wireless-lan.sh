@@ -156,7 +156,7 @@ take_turn() {
     until try_turn; do
         [ "$tries" -gt 0 ] || give_up busy "$interface: another command keeps it busy"
         tries=$((tries - 1))
-        sleep 0.2
+        pause 0.2
     done
 }
 
@@ -184,6 +184,11 @@ need_interface() {
     [ -d "/sys/class/net/$interface" ] || give_up no-interface "$interface: no such interface"
 }
 
+# pause SECONDS: a fraction where the shell's sleep knows fractions.
+pause() {
+    sleep "$1" 2>/dev/null || sleep 1
+}
+
 # start_time PID: when a living process began, in clock ticks; fails when there is none. With the
 # number it makes sure that a process is still the one that was noted, not a later one.
 start_time() {
@@ -209,30 +214,73 @@ runs() {
     [ -n "$began" ] && [ "$(start_time "$pid")" = "$began" ]
 }
 
+# end_process PID: ends a process and waits until it has gone.
+end_process() {
+    since=$(start_time "$1") || return 0
+    kill "$1" 2>/dev/null
+    tries=50
+    while [ "$tries" -gt 0 ] && [ "$(start_time "$1")" = "$since" ]; do
+        [ "$tries" -gt 20 ] || kill -KILL "$1" 2>/dev/null
+        pause 0.1
+        tries=$((tries - 1))
+    done
+}
+
 # stop_process FILE: ends the process noted there and waits until it has gone.
 stop_process() {
-    if runs "$1"; then
-        kill "$pid" 2>/dev/null
-        tries=50
-        while [ "$tries" -gt 0 ] && runs "$1"; do
-            [ "$tries" -gt 1 ] || kill -9 "$pid" 2>/dev/null
-            sleep 0.1
-            tries=$((tries - 1))
-        done
-    fi
+    ! runs "$1" || end_process "$pid"
     rm -f "$state/$1"
+}
+
+# processes NAME WORD: prints the numbers of the processes of this name that have WORD among their
+# arguments. An interface has its name in one network namespace: others are of another machine.
+processes() {
+    for entry in /proc/[0-9]*; do
+        { read -r comm <"$entry/comm"; } 2>/dev/null || continue
+        [ "$comm" = "$1" ] || continue
+        # shellcheck disable=SC3013 # all of our shells know it
+        [ "$entry/ns/net" -ef "/proc/$$/ns/net" ] || continue
+        ! tr '\000' '\n' <"$entry/cmdline" 2>/dev/null | grep -qxF -e "$2" || echo "${entry##*/}"
+    done
 }
 
 # drop_address: ends what gets an address, or tries to, and empties the addresses.
 drop_address() {
     stop_process lnk-ifup.pid
     stop_process dhcp.pid
+    stop_process dnsmasq.pid
     ip -4 address flush dev "$interface" 2>/dev/null
 }
 
-# leave_network: ends the supplicant, which leaves its network, and forgets the key.
+# leave_network: ends the supplicant, which leaves its network, and forgets the key. A command that
+# was killed may have left a supplicant without a note: it is known by its configuration.
 leave_network() {
     stop_following
     stop_process supplicant.pid
-    rm -f "$state/wpa_supplicant.conf" "$state/wpa_supplicant.pid"
+    for left_behind in $(processes wpa_supplicant "$state/wpa_supplicant.conf"); do
+        end_process "$left_behind"
+    done
+    rm -f "$state/wpa_supplicant.conf" "$state/wpa_supplicant.pid" "$state/events" "$state/hosting" \
+        "$state/offered"
+}
+
+# unblock_radio: lifts the soft block of the interface's radio. Ends the command when the radio stays
+# blocked: nothing can be heard or sent then.
+unblock_radio() {
+    for radio in "/sys/class/net/$interface/phy80211"/rfkill* \
+        "/sys/class/net/$interface/device/rfkill"/rfkill*; do
+        [ -r "$radio/soft" ] || continue
+        read -r blocked <"$radio/soft"
+        if [ "$blocked" = 1 ]; then
+            { echo 0 >"$radio/soft"; } 2>/dev/null
+            read -r blocked <"$radio/soft"
+            [ "$blocked" = 0 ] || limited 2 rfkill unblock "${radio##*/rfkill}" 2>/dev/null
+            read -r blocked <"$radio/soft"
+            [ "$blocked" = 0 ] ||
+                give_up rfkill-soft "the radio of $interface is switched off and stays so"
+        fi
+        read -r blocked <"$radio/hard"
+        [ "$blocked" = 0 ] ||
+            give_up rfkill-hard "a switch on the machine has turned the radio of $interface off"
+    done
 }

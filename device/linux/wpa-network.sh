@@ -4,9 +4,87 @@
 # for byte. The network is in the caller's variables:
 #   name        its bytes as hexadecimal digits
 #   security    open, wep or wpa
-#   adhoc       yes for a network of equals
 #   key, index, encryption   the key, which of the four WEP keys it is, and open or restricted
+#   adhoc       yes for a network of equals
+#   ap          yes where an access point of our own stands in for a network of equals
+#   offered     what the supplicant can do; nothing else is asked of it
 # shellcheck disable=SC2154
+
+# start_supplicant: starts one that has no network yet, so that it can be asked what it can do; sets
+# supplicant to its number.
+start_supplicant() {
+    offered=
+    common_lines >"$state/wpa_supplicant.conf"
+    # Nothing of what wpa_supplicant prints is kept: where it refuses a line it quotes it.
+    limited 10 wpa_supplicant -B -i "$interface" -D nl80211,wext -c "$state/wpa_supplicant.conf" \
+        -P "$state/wpa_supplicant.pid" >/dev/null 2>&1 || {
+        leave_network
+        give_up no-driver "wpa_supplicant does not start on $interface"
+    }
+    tries=50
+    while [ ! -s "$state/wpa_supplicant.pid" ] && [ "$tries" -gt 0 ]; do
+        pause 0.1
+        tries=$((tries - 1))
+    done
+    read -r supplicant <"$state/wpa_supplicant.pid" || fail 'wpa_supplicant left no process number'
+    note_process supplicant.pid "$supplicant"
+}
+
+# learn_offer: asks our supplicant what it can do. No build knows every kind of key management, and
+# each refuses a whole file for one word that it does not know.
+learn_offer() {
+    answer=$(ask get_capability key_mgmt)
+    offered=
+    for kind in WPA-PSK WPA-PSK-SHA256 FT-PSK SAE FT-SAE OWE; do
+        case " $answer " in
+        *" $kind "*) offered="$offered$kind " ;;
+        esac
+    done
+}
+
+# read_offer: what the supplicant of this network could do when it was given its networks.
+read_offer() {
+    offered=
+    [ ! -f "$state/offered" ] || read -r offered <"$state/offered"
+}
+
+# load_networks COMMAND...: gives our supplicant the networks that COMMAND prints; fails when it
+# refuses them. What it refuses although it has offered it is left out.
+load_networks() {
+    learn_offer
+    for less in '' H2E everything; do
+        case $less in
+        '') ! offers SAE || offered="$offered H2E" ;;
+        H2E) offered=${offered%H2E} ;;
+        everything) offered= ;;
+        esac
+        printf '%s\n' "$offered" >"$state/offered"
+        {
+            common_lines
+            "$@"
+        } >"$state/wpa_supplicant.conf"
+        [ "$(ask reconfigure)" != OK ] || return 0
+    done
+    return 1
+}
+
+# offers KIND
+offers() {
+    case " ${offered-} " in
+    *" $1 "*) ;;
+    *) return 1 ;;
+    esac
+}
+
+# common_lines: what stands before the networks. Management frames are protected where the driver
+# can: asked for in a network, it would be tried with drivers that cannot, and fail like a wrong key.
+# SAE by hash to element as well as by looping is what access points of 6 GHz need.
+common_lines() {
+    printf 'ctrl_interface=%s/control\n' "$state"
+    [ -z "${country-}" ] || printf 'country=%s\n' "$country"
+    [ -z "${offered-}" ] || echo 'pmf=1'
+    ! offers H2E || echo 'sae_pwe=2'
+}
 
 # hex TEXT: its bytes as hexadecimal digits. The texts here are names and keys: they go through
 # pipes and shell built-ins, never into another program's arguments.
@@ -88,15 +166,18 @@ name_bytes() {
     printf .
 }
 
-# wpa_lines KEY ADHOC: 64 hexadecimal digits are the key itself, 8 to 63 characters the phrase that
-# it is made from.
+# wpa_lines KEY: 64 hexadecimal digits are the key itself, 8 to 63 characters the phrase that it is
+# made from.
 wpa_lines() {
     phrase=
+    management=WPA-PSK
+    for kind in WPA-PSK-SHA256 FT-PSK; do
+        ! offers "$kind" || management="$management $kind"
+    done
     case ${#1} in
     64)
         is_hex "$1" || return 1
         psk=$1
-        management='WPA-PSK WPA-PSK-SHA256'
         ;;
     [89] | [1-5][0-9] | 6[0-3])
         # wpa_supplicant takes the phrase as it stands between the first and the last quotation
@@ -105,7 +186,9 @@ wpa_lines() {
         *[[:cntrl:]]*) return 1 ;;
         esac
         psk=\"$1\"
-        management='WPA-PSK WPA-PSK-SHA256 SAE'
+        for kind in SAE FT-SAE; do
+            ! offers "$kind" || management="$management $kind"
+        done
         case $1 in
         *\"*\#*)
             # Here it would see a comment: it gets the key that the phrase makes under this name.
@@ -114,17 +197,17 @@ wpa_lines() {
             psk=${psk##*psk=}
             psk=${psk%%[!0-9a-f]*}
             [ ${#psk} -eq 64 ] || return 1
-            phrase=$(hex "$1")
+            ! offers SAE || phrase=$(hex "$1")
             ;;
         esac
         ;;
     *) return 1 ;;
     esac
-    if [ "$2" = yes ]; then
+    if [ "$adhoc" = yes ]; then
         # Among equals only WPA2 is defined.
         printf 'proto=RSN\nkey_mgmt=WPA-PSK\npairwise=CCMP\ngroup=CCMP\npsk=%s\n' "$psk"
     else
-        printf 'key_mgmt=%s\nieee80211w=1\npsk=%s\n' "$management" "$psk"
+        printf 'key_mgmt=%s\npsk=%s\n' "$management" "$psk"
         [ -z "$phrase" ] || printf 'sae_password=%s\n' "$phrase"
     fi
 }
@@ -140,16 +223,22 @@ choose_security() {
 
 # network_block LINE...: the network with these further lines; fails when it cannot have its key.
 network_block() {
+    if [ "$security:$adhoc" = open:no ] && offers OWE; then
+        # Whoever is open for everybody may yet encrypt.
+        printf 'network={\nssid=%s\n' "$name"
+        printf '%s\n' "$@" 'key_mgmt=OWE' '}'
+    fi
     printf 'network={\nssid=%s\n' "$name"
     printf '%s\n' "$@"
     if [ "$adhoc" = yes ]; then
         # Channel 1 is where the network is made when nobody else has made it yet.
-        printf 'mode=1\nfrequency=2412\n'
+        [ "${ap-}" = yes ] && echo 'mode=2' || echo 'mode=1'
+        echo 'frequency=2412'
     fi
     case $security in
     open) echo 'key_mgmt=NONE' ;;
     wep) wep_lines "$key" "$((index - 1))" "$encryption" || return 1 ;;
-    wpa) wpa_lines "$key" "$adhoc" || return 1 ;;
+    wpa) wpa_lines "$key" || return 1 ;;
     esac
     echo '}'
 }

@@ -12,6 +12,10 @@ LISTED = "network id / ssid / bssid / flags\n0\tx\tany\t[CURRENT]\n"
 DISABLED = "network id / ssid / bssid / flags\n0\tx\tany\t[CURRENT][TEMP-DISABLED]\n"
 
 
+EVERYTHING = ("NONE IEEE8021X WPA-EAP WPA-PSK WPA-EAP-SHA256 WPA-PSK-SHA256 FT-PSK FT-EAP SAE "
+              "FT-SAE OWE DPP\n")
+
+
 def arguments(name, key="off", enc="off", mode="Managed", index="[1]", wpa=False):
     words = ["wlan0", "essid", name, "mode", mode, "key", key, "enc", enc]
     return ["wpa", *words] if wpa else [*words, *([index] if index else [])]
@@ -31,11 +35,32 @@ def set_up(*more):
     make_wlan0()
     note("status", CONNECTED)
     note("networks", LISTED)
+    note("capability-key_mgmt", EVERYTHING)
+    note("capability-modes", "IBSS AP MESH\n")
+    note("events")
+
+
+def event(text):
+    """The supplicant tells this from now on."""
+    with open(f"{machine.LOG}/events", "ab") as file:
+        file.write(b"\r<3>" + text.encode() + b"\n> ")
+
+
+def whole_configuration():
+    """What the supplicant was given: the lines before the networks, and each network, as
+    dictionaries."""
+    text = read(f"{machine.LOG}/conf")
+    match = re.fullmatch(
+        rb"((?:[a-z0-9_]+=.*\n)*)((?:network=\{\n(?:[a-z0-9_]+=.*\n)*\}\n)+)", text)
+    assert match, text
+
+    def values(lines):
+        return dict(line.split(b"=", 1) for line in lines.splitlines())
+    common = values(match[1])
+    assert common.pop(b"ctrl_interface") == machine.STATE.encode() + b"/control"
+    return common, [values(block[len(b"network={\n"):]) for block in match[2].split(b"}\n")[:-1]]
 
 
 def configuration():
-    """The network block that the supplicant was given."""
-    text = read(f"{machine.LOG}/conf")
-    match = re.fullmatch(rb"ctrl_interface=(.*)\nnetwork=\{\n((?:[a-z0-9_]+=.*\n)*)\}\n", text)
-    assert match and match[1] == machine.STATE.encode() + b"/control", text
-    return dict(line.split(b"=", 1) for line in match[2].splitlines())
+    """The last (as a rule the only) network block that the supplicant was given."""
+    return whole_configuration()[1][-1]

@@ -7,6 +7,7 @@ import os
 import re
 import subprocess
 import threading
+import time
 
 import pytest
 
@@ -14,7 +15,7 @@ import board
 import joining
 import machine
 from joining import configuration, iwset, iwset_wpa
-from machine import STATE, alive, calls, note, read, run, supplicants, wait_for, write
+from machine import STATE, alive, calls, forget, note, read, run, supplicants, wait_for, write
 from scans import HOSTILE, answer, convert, numbered
 
 
@@ -24,8 +25,8 @@ def every_join_succeeds():
 
 
 OPEN = {b"ssid": b"63616665", b"scan_ssid": b"1", b"key_mgmt": b"NONE"}
-WPA = {b"ssid": b"686f6d65206e6574", b"scan_ssid": b"1", b"ieee80211w": b"1"}
-ALL_MANAGEMENTS = b"WPA-PSK WPA-PSK-SHA256 SAE"
+WPA = {b"ssid": b"686f6d65206e6574", b"scan_ssid": b"1"}
+ALL_MANAGEMENTS = b"WPA-PSK WPA-PSK-SHA256 FT-PSK SAE FT-SAE"
 
 
 @pytest.mark.parametrize("options", [
@@ -47,18 +48,17 @@ def test_supplicant_and_its_files():
         b"-c", state + b"/wpa_supplicant.conf", b"-P", state + b"/wpa_supplicant.pid"]]
 
 
-@pytest.mark.parametrize("enc, algorithm", [("open", b"OPEN"), ("restricted", b"SHARED")])
-@pytest.mark.parametrize("key, digits", [
-    ("abcde", b"6162636465"), ("0123456789", b"0123456789"),
-    ("thirteen char", b"746869727465656e2063686172"),
-    ("0123456789abcdefABCDEF0123", b"0123456789abcdefABCDEF0123")])
-def test_wep(key, digits, enc, algorithm):
-    for index in (1, 2, 3, 4):
-        iwset("old wep", key, enc, index=f"[{index}]")
-        assert configuration() == {
-            b"ssid": b"6f6c6420776570", b"scan_ssid": b"1", b"key_mgmt": b"NONE",
-            b"wep_key%d" % (index - 1): digits, b"wep_tx_keyidx": b"%d" % (index - 1),
-            b"auth_alg": algorithm}
+@pytest.mark.parametrize("index, key, digits, enc, algorithm", [
+    (1, "abcde", b"6162636465", "open", b"OPEN"),
+    (2, "0123456789", b"0123456789", "restricted", b"SHARED"),
+    (3, "thirteen char", b"746869727465656e2063686172", "restricted", b"SHARED"),
+    (4, "0123456789abcdefABCDEF0123", b"0123456789abcdefABCDEF0123", "open", b"OPEN")])
+def test_wep(index, key, digits, enc, algorithm):
+    iwset("old wep", key, enc, index=f"[{index}]")
+    assert configuration() == {
+        b"ssid": b"6f6c6420776570", b"scan_ssid": b"1", b"key_mgmt": b"NONE",
+        b"wep_key%d" % (index - 1): digits, b"wep_tx_keyidx": b"%d" % (index - 1),
+        b"auth_alg": algorithm}
 
 
 def test_wep_without_an_index_is_the_first():
@@ -86,7 +86,8 @@ def test_wpa_phrase_that_a_reader_would_cut_at_a_comment(key, name):
 def test_wpa_64_digits():
     key = "0123456789abcdefABCDEF0123456789" * 2
     iwset_wpa("home net", key, "restricted")
-    assert configuration() == {**WPA, b"key_mgmt": b"WPA-PSK WPA-PSK-SHA256", b"psk": key.encode()}
+    assert configuration() == {**WPA, b"key_mgmt": b"WPA-PSK WPA-PSK-SHA256 FT-PSK",
+                               b"psk": key.encode()}
 
 
 HOSTED = {b"ssid": b"64657669636520", b"scan_ssid": b"1", b"mode": b"1", b"frequency": b"2412"}
@@ -110,19 +111,35 @@ def test_hosted_network(words, more, wanted):
 # ---- names
 
 
-@pytest.mark.parametrize("shell", machine.SHELLS)
-def test_what_the_list_shows_gives_the_name_back(shell):
+def names_read(names, shell, awk):
+    """What iwset makes of names: a process for each would take minutes."""
+    machine.install("awk", f"{machine.awk_directory(awk)}/awk")
+    text = (f'library={machine.DEVICE}/wireless-lan.sh; . "$library"\n'
+            '. "${library%/*}/wpa-network.sh"\n'
+            'for name in "$@"; do name_hex "$name"; echo; done')
+    out = subprocess.run([*(shell or ["sh"]), "-c", text, "iwset", *names],
+                         env=machine.environment(), stdout=subprocess.PIPE, check=True).stdout
+    return [bytes.fromhex(line.decode()) for line in out.splitlines()]
+
+
+@pytest.mark.parametrize("shell, awk", zip(machine.SHELLS, machine.AWKS))
+def test_what_the_list_shows_gives_the_name_back(shell, awk):
     names = [name for name in HOSTILE if name.strip(b"\0")]
     found = board.networks(convert(answer(numbered(names))))
-    for cell, name in zip(found, names):
-        status = iwset(cell["essid"], shell=shell)[0]
-        assert (status, configuration()[b"ssid"]) == (0, name.hex().encode())
+    assert names_read([cell["essid"] for cell in found], shell, awk) == names
 
 
-def test_the_name_itself():
-    for name in HOSTILE:
-        if b"\0" not in name and not re.search(rb"\\x[0-9A-Fa-f]{2}", name):
-            assert (iwset(name)[0], configuration()[b"ssid"]) == (0, name.hex().encode())
+@pytest.mark.parametrize("shell, awk", zip(machine.SHELLS, machine.AWKS))
+def test_the_name_itself(shell, awk):
+    names = [name for name in HOSTILE
+             if b"\0" not in name and not re.search(rb"\\x[0-9A-Fa-f]{2}", name)]
+    assert names_read(names, shell, awk) == names
+
+
+@pytest.mark.parametrize("name", [b"a\"b$(id)", b"\\", b"-n", b"line\nend", b"\xff\xfe", b"*",
+                                  b" "])
+def test_name_arrives(name):
+    assert (iwset(name)[0], configuration()[b"ssid"]) == (0, name.hex().encode())
 
 
 def test_names_that_are_words_of_the_command():
@@ -275,9 +292,12 @@ def test_access_point_that_shows_up_late_refuses_the_key():
 def test_follower_of_an_old_network_leaves_the_new_one_alone():
     absent()
     iwset_wpa("x", "12345678")
+    old = followers()
+    assert len(old) == 1
     iwset("another")
     note("status", joining.HANDSHAKE)
-    assert wait_for(lambda: not followers())
+    note("networks", joining.DISABLED)
+    assert wait_for(lambda: not any(read(path) for path in old))
     assert alive(supplicants()[-1])
 
 
@@ -316,3 +336,233 @@ def test_no_program_is_given_a_key(label, key, options):
     assert held == ([] if label in ("refused", "WEP text") else [f"{STATE}/wpa_supplicant.conf"])
     assert run("lnk-ifdown", "wlan0")[0] == 0
     assert not os.path.exists(f"{STATE}/wpa_supplicant.conf")
+
+
+# ---- what the supplicant and the radio can do
+
+
+def test_management_frames_are_protected_where_the_driver_can():
+    """Asked for in the network, a driver that cannot would fail like a wrong key."""
+    iwset_wpa("home net", "12345678")
+    common, networks = joining.whole_configuration()
+    assert common == {b"pmf": b"1", b"sae_pwe": b"2"}
+    assert len(networks) == 1 and b"ieee80211w" not in networks[0]
+
+
+@pytest.mark.parametrize("offer, managements, common", [
+    ("WPA-PSK WPA-PSK-SHA256", b"WPA-PSK WPA-PSK-SHA256", {b"pmf": b"1"}),
+    ("WPA-PSK FT-PSK SAE", b"WPA-PSK FT-PSK SAE", {b"pmf": b"1", b"sae_pwe": b"2"}),
+    ("NONE WPA-EAP", b"WPA-PSK", {})])
+def test_only_what_the_supplicant_can_do_is_asked_of_it(offer, managements, common):
+    note("capability-key_mgmt", offer + "\n")
+    assert iwset_wpa("home net", "12345678")[0] == 0
+    assert joining.whole_configuration()[0] == common
+    assert configuration()[b"key_mgmt"] == managements
+
+
+@pytest.mark.parametrize("words, managements, common", [
+    ("sae_pwe", ALL_MANAGEMENTS, {b"pmf": b"1"}),             # older than hash to element
+    ("SAE\nsae_pwe\nFT-\n", b"WPA-PSK", {}), ("pmf", b"WPA-PSK", {})])
+def test_what_it_refuses_all_the_same_is_left_out(words, managements, common):
+    """One word that a build does not know makes it refuse the whole file."""
+    note("refused-words", words)
+    assert iwset_wpa("home net", "12345678")[0] == 0
+    assert joining.whole_configuration()[0] == common
+    assert configuration()[b"key_mgmt"] == managements
+
+
+def test_open_network_that_may_encrypt():
+    iwset("cafe")
+    networks = joining.whole_configuration()[1]
+    assert networks == [{**OPEN, b"key_mgmt": b"OWE"}, OPEN]
+    note("capability-key_mgmt", "NONE WPA-PSK\n")
+    iwset("cafe")
+    assert joining.whole_configuration()[1] == [OPEN]
+
+
+def reason():
+    return read("/run/wireless-lan/reason")
+
+
+@pytest.mark.parametrize("refuses", ["file", "network"])
+def test_wep_with_a_supplicant_that_has_none(refuses):
+    if refuses == "file":
+        note("refused-words", "wep_key")
+    else:
+        note("networks", "network id / ssid / bssid / flags\n0\tx\tany\t[DISABLED]\n")
+    assert iwset("old wep", "abcde", "open") == (
+        1, b"", b"iwset: this wpa_supplicant was built without WEP\n")
+    assert reason() == b"no-wep\n"
+    assert not alive(supplicants()[-1])
+
+
+def test_country():
+    os.makedirs("/etc/default", exist_ok=True)
+    write("/etc/default/wireless-lan", "COUNTRY=DE\n")
+    iwset("cafe")
+    os.remove("/etc/default/wireless-lan")
+    assert joining.whole_configuration()[0][b"country"] == b"DE"
+
+
+@pytest.mark.parametrize("tool", ["wpa_supplicant", "wpa_cli"])
+def test_missing_tool_is_named(tool):
+    os.rename(f"/usr/sbin/{tool}", f"/usr/sbin/{tool}.away")
+    os.remove(f"{machine.CHOSEN}/{tool}")
+    try:
+        assert iwset("cafe") == (
+            1, b"", f"iwset: {tool} is missing: it has to be installed\n".encode())
+    finally:
+        os.rename(f"/usr/sbin/{tool}.away", f"/usr/sbin/{tool}")
+    assert reason() == f"missing-tool {tool}\n".encode()
+
+
+# ---- the radio
+
+
+def make_radio(soft, hard):
+    radio = "/sys/class/net/wlan0/phy80211/rfkill7"
+    os.makedirs(radio)
+    write(f"{radio}/soft", f"{soft}\n")
+    write(f"{radio}/hard", f"{hard}\n")
+    return f"{radio}/soft"
+
+
+def test_soft_block_is_lifted():
+    soft = make_radio(1, 0)
+    assert iwset("cafe")[0] == 0
+    assert read(soft) == b"0\n"
+    assert reason() == b""
+
+
+def test_hard_block_is_named():
+    make_radio(0, 1)
+    assert iwset("cafe") == (
+        1, b"", b"iwset: a switch on the machine has turned the radio of wlan0 off\n")
+    assert reason() == b"rfkill-hard\n"
+    assert calls("wpa_supplicant") == []
+
+
+# ---- hosting
+
+
+def hosts(**options):
+    return iwset("device ", index=None, mode="Ad-Hoc", **options)
+
+
+@pytest.mark.parametrize("modes, mode", [("IBSS AP MESH", b"1"), ("AP", b"2")])
+def test_hosting_as_the_driver_can(modes, mode):
+    note("capability-modes", modes + "\n")
+    assert hosts()[0] == 0
+    assert configuration() == {**HOSTED, b"mode": mode, b"key_mgmt": b"NONE"}
+    assert os.path.exists(f"{STATE}/hosting") == (mode == b"2")
+    assert reason() == b""
+
+
+def test_hosting_that_the_driver_cannot():
+    note("capability-modes", "\n")
+    assert hosts() == (1, b"", b"iwset: the driver of wlan0 can host no network\n")
+    assert reason() == b"no-hosting\n"
+
+
+def test_hosting_that_does_not_come_about():
+    note("status", "wpa_state=SCANNING\n")
+    assert hosts() == (1, b"", b"iwset: wlan0 can host no network\n")
+    assert reason() == b"no-hosting\n"
+    assert not alive(supplicants()[-1])
+
+
+# ---- events
+
+
+BSS = "02:00:00:00:00:01"
+
+
+@pytest.mark.parametrize("event", [
+    'CTRL-EVENT-SSID-TEMP-DISABLED id=0 ssid="x" auth_failures=1 duration=10 reason=WRONG_KEY',
+    f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=15"])
+def test_event_of_a_wrong_key(event):
+    """A wrong key of WPA3 shows in no state: that stays AUTHENTICATING."""
+    note("status", "wpa_state=AUTHENTICATING\n")
+    joining.event(event)
+    assert iwset_wpa("x", "12345678") == (1, b"", b"iwset: the access point refuses the key\n")
+    assert reason() == b"wrong-key\n"
+    assert not alive(supplicants()[-1])
+
+
+@pytest.mark.parametrize("event, word", [
+    (f"CTRL-EVENT-ASSOC-REJECT bssid={BSS} status_code=17", b"refused\n"),
+    (f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=0 auth_transaction=2 status_code=17", b"refused\n"),
+    ("CTRL-EVENT-NETWORK-NOT-FOUND ", b"not-found\n"),
+    # a name that says what the supplicant would
+    ('CTRL-EVENT-SSID-TEMP-DISABLED id=0 ssid="<3>CTRL-EVENT-CONNECTED reason=WRONG_KEY" '
+     "auth_failures=1 duration=10 reason=CONN_FAILED", b"")])
+def test_event_that_decides_nothing_yet(event, word):
+    note("status", "wpa_state=AUTHENTICATING\n")
+    joining.event(event)
+    begin = time.monotonic()
+    assert iwset_wpa("x", "12345678") == (0, b"", b"")
+    assert time.monotonic() - begin > 10, "it is given its time"
+    assert reason() == word
+    late = supplicants()[-1]
+    assert alive(late)
+    # The key is in no list of processes for as long as the join is watched.
+    assert followers()
+    assert not [path for path in glob.glob("/proc/[0-9]*/cmdline") if b"12345678" in read(path)]
+    joining.event(f"CTRL-EVENT-CONNECTED - Connection to {BSS} completed [id=0 id_str=]")
+    assert wait_for(lambda: not followers())
+    assert reason() == b""
+    assert alive(late)
+
+
+def test_follower_waits_for_its_turn():
+    """It must not end what another command has just begun."""
+    note("status", "wpa_state=AUTHENTICATING\n")
+    iwset_wpa("x", "12345678")
+    late = supplicants()[-1]
+    other = subprocess.Popen(["flock", f"{STATE}/lock", "sleep", "600"])
+    assert wait_for(lambda: subprocess.run(["flock", "-n", f"{STATE}/lock", "true"],
+                                           check=False).returncode != 0)
+    joining.event(f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=15")
+    # Another command has started a supplicant of its own meanwhile.
+    new = subprocess.Popen(["sleep", "600"])
+    machine_time = read(f"/proc/{new.pid}/stat").rsplit(b")", 1)[1].split()[19].decode()
+    write(f"{STATE}/supplicant.pid", f"{new.pid} {machine_time}\n")
+    subprocess.run(["pkill", "-P", str(other.pid)], check=False)
+    other.kill()
+    other.wait()
+    assert wait_for(lambda: not followers())
+    assert new.poll() is None and alive(late)
+    assert os.path.exists(f"{STATE}/wpa_supplicant.conf")
+
+
+# ---- after a command that was killed
+
+
+def test_killed_while_the_supplicant_starts():
+    """Power button, out of memory: the supplicant stays, and no note says which it is."""
+    note("slow-supplicant")
+    killed = machine.start("iwset", *joining.arguments("x"))
+    assert wait_for(supplicants)
+    killed.kill()
+    killed.wait()
+    forget("slow-supplicant")
+    left = supplicants()[-1]
+    assert alive(left) and not os.path.exists(f"{STATE}/supplicant.pid")
+    assert iwset("cafe")[0] == 0
+    assert [alive(pid) for pid in supplicants()] == [False, True]
+    os.remove(f"{STATE}/supplicant.pid")
+    assert run("lnk-ifdown", "wlan0")[0] == 0
+    assert not any(alive(pid) for pid in supplicants())
+
+
+# ---- busybox as the only userland
+
+
+@pytest.mark.parametrize("name, options", [
+    ("cafe", {}), ("old wep", {"key": "abcde", "enc": "open"}),
+    ("home net", {"key": "12345678", "enc": "open", "wpa": True})])
+def test_in_busybox(name, options):
+    assert iwset(name, wrap=machine.in_busybox(), **options) == (0, b"", b"")
+    assert configuration()[b"ssid"] == name.encode().hex().encode()
+    assert run("lnk-ifdown", "wlan0", wrap=machine.in_busybox()) == (0, b"", b"")
+    assert not alive(supplicants()[-1])

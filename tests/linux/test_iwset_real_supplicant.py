@@ -56,7 +56,7 @@ def test_wpa_key(key):
 
 
 @pytest.mark.parametrize("field, words, options, value", [
-    ("key_mgmt", ("12345678", "open"), {"wpa": True}, b"WPA-PSK WPA-PSK-SHA256 SAE"),
+    ("key_mgmt", ("12345678", "open"), {"wpa": True}, b"WPA-PSK FT-PSK WPA-PSK-SHA256 SAE FT-SAE"),
     ("wep_tx_keyidx", ("abcde", "open"), {"index": "[3]"}, b"2"),
     ("wep_key2", ("abcde", "open"), {"index": "[3]"}, b"*"),
     ("auth_alg", ("abcde", "restricted"), {}, b"SHARED"),
