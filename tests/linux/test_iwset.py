@@ -116,10 +116,10 @@ def names_read(names, shell, awk):
     machine.install("awk", f"{machine.awk_directory(awk)}/awk")
     text = (f'library={machine.DEVICE}/wireless-lan.sh; . "$library"\n'
             '. "${library%/*}/wpa-network.sh"\n'
-            'for name in "$@"; do name_hex "$name"; echo; done')
+            'for name in "$@"; do name_hex "$name"; done')
     out = subprocess.run([*(shell or ["sh"]), "-c", text, "iwset", *names],
                          env=machine.environment(), stdout=subprocess.PIPE, check=True).stdout
-    return [bytes.fromhex(line.decode()) for line in out.splitlines()]
+    return [bytes.fromhex(line.decode()) for line in out.split()]
 
 
 @pytest.mark.parametrize("shell, awk", zip(machine.SHELLS, machine.AWKS))

@@ -118,7 +118,7 @@ def blocks_of():
             write(f"{directory}/{number}", text)
         script = (f'library={machine.DEVICE}/wireless-lan.sh; . "$library"\n'
                   f". {machine.DEVICE}/wpa-network.sh; . {machine.DEVICE}/preferred.sh\n"
-                  f"cd {directory}; for list in *; do\n"
+                  f"cd {directory}; offered='WPA-PSK SAE '; for list in *; do\n"
                   "preferred_blocks $list >$list.out 2>$list.log; done")
         subprocess.run(["sh", "-c", script], check=True)
         return [(read(f"{directory}/{number}.out"), read(f"{directory}/{number}.log"))
