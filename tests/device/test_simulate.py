@@ -45,6 +45,38 @@ def test_an_ordinary_user_can_run_it():
     assert done.stdout.endswith("done\n") and not os.path.exists("/etc/mine")
 
 
+CHROOT = """
+cd "$1"
+for part in /*; do
+    if [ -L "$part" ]; then
+        cp -P "$part" .
+    elif [ -d "$part" ]; then
+        mkdir ".$part"
+        mount --rbind "$part" ".$part"
+    fi
+done
+exec chroot . "$2" connected sh -c "ip -4 -o address show wlan0; echo done"
+"""
+
+
+def test_it_runs_in_a_root_that_is_no_mount_point():
+    with tempfile.TemporaryDirectory(dir="/var/tmp") as folder:
+        user = [] if os.getuid() == 0 else ["--map-root-user"]
+        done = run("unshare", *user, "--mount", "sh", "-euc", CHROOT, "sh", folder, SIMULATE)
+    assert "192.168.7.23/24" in done.stdout and done.stdout.endswith("done\n"), done.stdout
+
+
+def test_what_is_missing_is_named():
+    with tempfile.TemporaryDirectory(dir="/tmp") as folder:
+        for tool in ("dirname", "sh"):
+            os.symlink(shutil.which(tool), f"{folder}/{tool}")
+        done = run("unshare", *([] if os.getuid() == 0 else ["--map-root-user"]), "--mount", "sh",
+                   "-euc", "mount -t tmpfs none /usr/sbin; PATH=$1 exec $2 street true", "sh",
+                   folder, SIMULATE)
+    assert done.returncode == 1
+    assert done.stdout == "simulate: cc is missing; tools/set-up installs what is needed\n"
+
+
 def test_a_device_begins_without_files_of_the_machine(device):
     d = device("street")
     with tempfile.NamedTemporaryFile(dir="/tmp") as late:

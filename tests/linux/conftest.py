@@ -18,8 +18,8 @@ def pytest_cmdline_main(config):
     if hasattr(config, "workerinput") or config.option.collectonly:
         return
     user = "" if os.geteuid() == 0 else "-r"
-    place = (f"unshare {user} -mnpf --mount-proc --kill-child --propagation private "
-             f"{sys.executable}")
+    place = (f"unshare {user} -mnpf --mount-proc --kill-child --propagation unchanged "
+             f"{machine.TOP}/device/sim/own-mounts {sys.executable}")
     workers = config.option.numprocesses
     config.option.tx = [f"popen//python={place}"] * (workers if isinstance(workers, int) else 1)
     config.option.numprocesses = None

@@ -16,13 +16,15 @@ import subprocess
 
 import pytest
 
-BUILD = os.environ.get("WIRELESS_LAN_BUILD", pathlib.Path(__file__).parents[2] / "build")
+TOP = pathlib.Path(__file__).parents[2]
+BUILD = os.environ.get("WIRELESS_LAN_BUILD", TOP / "build")
 SAVE = pathlib.Path(BUILD).resolve() / "tests/save-program"
 # A leak cannot be looked for under strace.
 ENVIRONMENT = {**os.environ, "ASAN_OPTIONS": os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0"}
 KINDS = ["basic", "preferred"]
 ROOT = os.geteuid() == 0
-UNSHARE = ["unshare", "-m"] if ROOT else ["unshare", "-rm"]
+UNSHARE = ["unshare", "-m" if ROOT else "-rm", "--propagation", "unchanged",
+           str(TOP / "device/sim/own-mounts")]
 as_root = pytest.mark.skipif(not ROOT, reason="needs root")
 
 
