@@ -59,6 +59,16 @@ def device():
     yield from devices()
 
 
+@pytest.fixture
+def german(monkeypatch):
+    """The environment of a program that speaks German, and of its device. Named whole: where the
+    locale is C, or C.UTF-8 in later releases of the C library, nothing is translated."""
+    settings = {"LC_ALL": "de_DE.UTF-8", "LANGUAGE": "de"}
+    for name, value in settings.items():
+        monkeypatch.setenv(name, value)
+    return settings
+
+
 @pytest.fixture(scope="module")
 def shared_device():
     """The same, for all tests of a module."""

@@ -226,12 +226,12 @@ def catalogue(directory):
     return {"/share/locale/de/LC_MESSAGES/wireless-lan.mo": done.stdout}
 
 
-def test_texts_are_translated_but_for_one(device, tmp_path):
+def test_texts_are_translated_but_for_one(device, german, tmp_path):
     d = device("none", rate=50, scan=None, files=catalogue(tmp_path))
     for name in ("iwset", "lnk-ifup", "lnk-ifdown"):
         d.command(name, hook=":")
     d.set_networks("one", "two")
-    app = d.start(environment={"LANGUAGE": "de"})
+    app = d.start(environment=german)
     app.wait_title("· " + IDLE)
     app.wait_state(1, "· Disconnect")
     d.clock.rate = 0

@@ -84,11 +84,8 @@ def test_a_device_begins_without_files_of_the_machine(device):
     assert d.file("/etc/wireless.conf") is None and d.file("/etc/build_in_wifi") is None
 
 
-def test_a_language_that_the_machine_has_not(device, monkeypatch):
-    for name in ("LC_ALL", "LC_MESSAGES", "LANGUAGE"):
-        monkeypatch.delenv(name, raising=False)
-    monkeypatch.setenv("LANG", "de_DE.UTF-8")
-    app = device("connected").start(environment={"LANG": "de_DE.UTF-8"})
+def test_a_language_that_the_machine_has_not(device, german):
+    app = device("connected").start(environment=german)
     app.wait_title("Auswahl des Funknetzes")
     assert app.quit() == 0
 

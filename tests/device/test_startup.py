@@ -205,14 +205,14 @@ def test_no_memory_for_the_state(device):
     assert d.commands() == []
 
 
-def test_translated_texts(device):
+def test_translated_texts(device, german):
     catalogue = subprocess.run(["msgfmt", "-o", "-", f"{TOP}/po/de.po"], check=True,
                                stdout=subprocess.PIPE).stdout
-    german = gettext.GNUTranslations(io.BytesIO(catalogue)).gettext
+    translated = gettext.GNUTranslations(io.BytesIO(catalogue)).gettext
     d = device("connected", files={"/share/locale/de/LC_MESSAGES/wireless-lan.mo": catalogue})
     d.dissociate()
-    app = d.start(environment={"LANGUAGE": "de"})
-    app.wait_title(german("Wireless network selection"))
+    app = d.start(environment=german)
+    app.wait_title(translated("Wireless network selection"))
     wait_until(app.networks, "the list")
     shown = {
         "Wireless LAN": app.title, "Settings": app.find(type="GtkFrame")["label"],
@@ -221,8 +221,8 @@ def test_translated_texts(device):
                    [one["title"] for one in app.columns("view-press")])),
         "Disconnect": app.networks()[0][4],
     }
-    assert shown == {text: german(text) for text in shown}
-    assert german("Disconnect") != "Disconnect" and german("Wireless LAN") != ""
+    assert shown == {text: translated(text) for text in shown}
+    assert translated("Disconnect") != "Disconnect" and translated("Wireless LAN") != ""
     assert app.quit() == 0
 
 
