@@ -235,7 +235,7 @@ def test_interface_names_that_no_kernel_gives(device):
 
 @pytest.mark.parametrize("name", ["essid_tmp", "key_tmp"])
 def test_a_name_in_tmp_that_cannot_be_had(device, name):
-    """Name and key belong together: both files are ours, or neither is there and nothing is told."""
+    """Name and key belong together: both files are ours, or neither is there and nothing is run."""
     d, app = idle(device, "cafe", "bar")
     d.sh(f"echo old >/tmp/essid_tmp; echo old >/tmp/key_tmp; rm /tmp/{name}; mkdir /tmp/{name}")
     connect(app, 0)

@@ -354,11 +354,9 @@ def test_resizing_leaves_the_view_where_it_is(device):
     left, top, width, height = dialog.find(FRONT).parent["rect"]
     d.display.click(left + width // 2, top + height // 2, 5, count=30)
     wait_until(lambda: edges()[1] == 0, lambda: f"the end; {edges()}")
-    window = d.display._window(d.display.root, LIST)
     for change in (-40, 30):
         before = dialog.tree()["rect"]
-        window.configure(height=before[3] + change)
-        d.display._x.sync()
+        d.display.resize_window(LIST, height=before[3] + change)
         wait_until(lambda: dialog.tree()["rect"][3] != before[3], "the new height")
         assert edges()[0] > height, edges()
 

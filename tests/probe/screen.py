@@ -191,6 +191,12 @@ class Screen:
         window.send_event(message)
         self._x.sync()
 
+    def resize_window(self, title, **size):
+        """Asks for another `width` or `height` of a window."""
+        window = wait_until(lambda: self._window(self.root, title), f"a window {title!r}")
+        window.configure(**size)
+        self._x.sync()
+
     def _window(self, window, title):
         """The window with that title which the window manager has taken in."""
         try:
