@@ -4,10 +4,10 @@ the program.
 
 scan/NAME.txt is the output of iwlist, scan/NAME.cells its networks; interfaces/NAME.txt is the
 kernel's list, interfaces/NAME.names its interfaces; iw/NAME.txt is the output of the tool iw,
-iw/NAME.cells its networks. Bytes that are no printable ASCII, and the
-backslash, are written as \xNN. The inputs named real-... are the unchanged output of Wireless-Tools
-30 and of Linux 6.1 on simulated radios (mac80211_hwsim); so are all of iw, whose names tell the
-kernel and which tests/lab/record-scans makes.
+iw/NAME.cells its networks. Bytes that are no printable ASCII, and the backslash, are written as
+\xNN. The inputs named real-... are the unchanged output of Wireless-Tools 30 and of Linux 6.1 on
+simulated radios (mac80211_hwsim); so are those of iw whose names tell a kernel, which
+tests/lab/record-scans makes. report-... are written by hand, in the form that other cards give.
 
 For a new input: pytest tests/goldens --write-goldens"""
 
