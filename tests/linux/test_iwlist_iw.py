@@ -54,7 +54,7 @@ def kinds(out):
 @pytest.mark.parametrize("awk", machine.AWKS)
 def test_goldens(awk):
     """What iw prints on three kernels becomes the records beside it."""
-    assert len(GOLDENS) >= 100
+    assert len(GOLDENS) >= 200
     rules = [part for name in ("networks", "from-iw")
              for part in ("-f", f"{machine.DEVICE}/{name}.awk")]
     for path in GOLDENS:
