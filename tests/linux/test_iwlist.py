@@ -193,18 +193,38 @@ def test_reason_of_an_earlier_failure_is_gone_after_a_scan():
     assert not os.path.exists(REASON)
 
 
-@pytest.mark.parametrize("soft, hard, reason", [
-    (1, 0, b"rfkill-soft\n"), (0, 1, b"rfkill-hard\n"), (1, 1, b"rfkill-hard\n")])
-def test_radio_that_is_switched_off(soft, hard, reason):
+def radio(soft, hard, flags):
+    """A card whose radio is blocked so, and the kernel's flags of its interface."""
     machine.make_wlan0()
-    for name, value in (("soft", soft), ("hard", hard)):
-        os.makedirs("/sys/class/net/wlan0/phy80211/rfkill3", exist_ok=True)
-        write(f"/sys/class/net/wlan0/phy80211/rfkill3/{name}", f"{value}\n")
-    text = read(f"{machine.SAMPLES}/iwlist-scan-error-interface-down.txt")
-    note("scan-error", text)
-    status, out, err = run("iwlist", "wlan0", "scan")
-    assert (status, out, read(REASON)) == (255, b"", reason)
-    assert err.startswith(b"iwlist: wlan0: the radio is switched off by ") and err.endswith(text)
+    switch = "/sys/class/net/wlan0/phy80211/rfkill3"
+    os.makedirs(switch)
+    write(f"{switch}/soft", f"{soft}\n")
+    write(f"{switch}/hard", f"{hard}\n")
+    write("/sys/class/net/wlan0/flags", f"{flags}\n")
+    return f"{switch}/soft"
+
+
+def test_radio_that_a_switch_has_turned_off():
+    radio(1, 1, "0x1002")
+    assert run("iwlist", "wlan0", "scan") == (
+        1, b"", b"iwlist: a switch on the machine has turned the radio of wlan0 off\n")
+    assert read(REASON) == b"rfkill-hard\n"
+    assert calls("iwlist") == []
+
+
+def test_radio_that_is_blocked_by_software_is_switched_on():
+    choose("iwlist", "ip")
+    soft = radio(1, 0, "0x1002")
+    assert len(board.networks(convert(answer([(address_of(1), b"a")])))) == 1
+    assert read(soft) == b"0\n"
+    assert calls("ip") == [[b"ip", b"link", b"set", b"dev", b"wlan0", b"up"]]
+
+
+def test_radio_that_is_on_is_left_alone():
+    choose("iwlist", "ip")
+    radio(0, 0, "0x1003")
+    convert(answer([(address_of(1), b"a")]))
+    assert calls("ip") == []
 
 
 def test_strongest_first():

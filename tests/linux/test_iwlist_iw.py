@@ -152,6 +152,15 @@ def test_iw_that_hangs():
     assert machine.wait_for(lambda: not machine.running("sleep"))
 
 
+def test_scan_that_takes_too_long():
+    """What has been found so far is the answer."""
+    note("iw-scan-hangs")
+    note("iw-scan dump", network(b"cafe"))
+    found = scan(command=patient_for_a_second("iwlist"))
+    assert [one["essid"] for one in found] == [b"cafe"]
+    assert machine.wait_for(lambda: not machine.running("sleep"))
+
+
 @pytest.mark.parametrize("error, reason", [
     (b"command failed: No such device (-19)\n", b"no-interface\n"),
     (b"command failed: Network is down (-100)\n", b"command failed: Network is down (-100)\n")])
