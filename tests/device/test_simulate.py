@@ -45,6 +45,21 @@ def test_an_ordinary_user_can_run_it():
     assert done.stdout.endswith("done\n") and not os.path.exists("/etc/mine")
 
 
+MOUNTED = """
+mkdir "$1/proc"
+mount --bind /proc/sys "$1/proc"
+mount -o remount,bind,ro "$1/proc"
+exec "$2" none sh -c "ls $1/proc; echo done"
+"""
+
+
+def test_a_file_system_that_takes_nothing_may_be_mounted_anywhere():
+    with tempfile.TemporaryDirectory(dir="/var/tmp") as directory:
+        done = run("unshare", *([] if os.getuid() == 0 else ["-r"]), "-m", "sh", "-euc", MOUNTED,
+                   "sh", directory, SIMULATE)
+    assert done.stdout.endswith("done\n") and "kernel" in done.stdout, done.stdout
+
+
 CHROOT = """
 cd "$1"
 for part in /*; do
