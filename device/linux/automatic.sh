@@ -6,6 +6,8 @@
 #   automatic     the supplicant that runs was started by the automatic
 #   follower.pid  wpa_cli, which tells wpa-action of every association of our supplicant
 #   addressed     lnk-ifup has been asked for an address in this network
+#   list          the list that the automatic has worked with last
+#   no-wep        the supplicant that runs knows no WEP
 #   next.conf     the supplicant's next configuration, taken over once its network is lost
 # "$interface", "$library" and "$state" are those of wireless-lan.sh.
 # shellcheck disable=SC2034,SC2154
@@ -80,7 +82,7 @@ follow_supplicant() {
 # stop_following: forgets the network that is being left.
 stop_following() {
     stop_process follower.pid
-    rm -f "$state/addressed" "$state/automatic" "$state/next.conf"
+    rm -f "$state/addressed" "$state/automatic" "$state/next.conf" "$state/no-wep"
 }
 
 # adopt_next: the supplicant goes on with its next configuration.

@@ -160,8 +160,9 @@ preferred_blocks() {
             esac
             choose_security
             if [ -z "$wanted" ] && [ "$security" = wep ]; then
-                case $index in
-                [1-4]) ;;
+                case ${without_wep-no}:$index in
+                yes:*) wanted='this wpa_supplicant knows no WEP' ;;
+                no:[1-4]) ;;
                 *) wanted='its key has no number from 1 to 4' ;;
                 esac
             fi

@@ -19,6 +19,8 @@ run_dir=/run/wireless-lan
 . "${library%/*}/managers.sh"
 # shellcheck source=device/linux/automatic.sh
 . "${library%/*}/automatic.sh"
+# shellcheck source=device/linux/address.sh
+. "${library%/*}/address.sh"
 
 # say TEXT: one line on standard error. No text here ever holds a key.
 say() {
@@ -244,18 +246,11 @@ processes() {
     done
 }
 
-# drop_address: ends what gets an address, or tries to, and empties the addresses.
-drop_address() {
-    stop_process lnk-ifup.pid
-    stop_process dhcp.pid
-    stop_process dnsmasq.pid
-    ip -4 address flush dev "$interface" 2>/dev/null
-}
-
 # leave_network: ends the supplicant, which leaves its network, and forgets the key. A command that
 # was killed may have left a supplicant without a note: it is known by its configuration.
 leave_network() {
     stop_following
+    forget_ipv6
     stop_process supplicant.pid
     for left_behind in $(processes wpa_supplicant "$state/wpa_supplicant.conf"); do
         end_process "$left_behind"

@@ -22,11 +22,12 @@ SAMPLES = os.path.join(HERE, "samples")
 EXPECTED = os.path.join(HERE, "expected")
 
 COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "wireless-lan-auto", "iwlist", "cat", "ap-address",
-            "udhcpc-script", "wpa-action")
-LIBRARIES = ("wireless-lan.sh", "automatic.sh", "managers.sh", "preferred.sh", "settings.sh",
-             "wpa-network.sh", "real-tool.sh", "dhclient-hook")
+            "udhcpc-script", "dhcpcd-script", "name-servers", "wpa-action")
+LIBRARIES = ("wireless-lan.sh", "address.sh", "automatic.sh", "managers.sh", "preferred.sh",
+             "settings.sh", "wpa-network.sh", "real-tool.sh", "dhclient-hook")
 STUBS = ("iwlist", "cat", "wpa_supplicant", "wpa_cli", "ip", "iw", "dhcpcd", "udhcpc", "dhclient",
-         "nmcli", "connmanctl")
+         "nmcli", "connmanctl", "networkctl", "ifquery", "ifdown", "iwd", "hostapd",
+         "systemd-network", "resolvectl", "resolvconf")
 CLIENTS = ("dhcpcd", "udhcpc", "dhclient")
 SHELLS = (None, ("busybox", "sh"), ("bash", "--posix"))
 AWKS = ("mawk", "gawk", "busybox")

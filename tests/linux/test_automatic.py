@@ -121,6 +121,23 @@ def test_the_list_in_its_order():
     assert followed.encode() == read(f"{machine.LOG}/followers")
 
 
+def test_wep_in_a_build_without_it():
+    """The others are joined all the same."""
+    save(OLD, HOME)
+    joining.note("status", SEARCHING)
+    joining.note("refused-words", "wep_key\n")
+    errors = f"{machine.ROOT}/errors"
+    with open(errors, "wb") as file:
+        subprocess.Popen([f"{machine.DEVICE}/wireless-lan-auto", "wlan0"], env=environment(),
+                         stderr=file)
+    assert wait_for(lambda: b"knows no WEP\n" in read(errors) and names() == ["Home"])
+    assert b"wireless-lan-auto: Old School is left out: this wpa_supplicant knows no WEP\n" in \
+        read(errors)
+    save(OLD, MARKET)
+    assert wait_for(lambda: names() == ["Market"])
+    assert len(supplicants()) == 1
+
+
 def test_an_address_comes_with_the_network_and_goes_with_it():
     begin(HOME)
     joined()
@@ -130,6 +147,28 @@ def test_an_address_comes_with_the_network_and_goes_with_it():
     assert wait_for(lambda: not alive(clients()[-1]))
     joined()
     assert wait_for(lambda: len(clients()) == 2 and alive(clients()[-1]))
+
+
+def test_busybox_is_enough():
+    """No other tool than its own, the supplicant's, ip and a DHCP client."""
+    wrap = machine.in_busybox()
+    save(HOME, MARKET)
+    joining.note("status", SEARCHING)
+    subprocess.Popen([*wrap, f"{machine.DEVICE}/wireless-lan-auto", "wlan0"], env=environment())
+    assert wait_for(lambda: running() and numbers("followers"))
+    assert names() == ["Home", "Market"]
+    save(MARKET, HOME)
+    assert wait_for(reconfigured)
+    joining.note("status", f"{CONNECTED}id=0\n")
+    subprocess.run([*wrap, f"{machine.DEVICE}/wpa-action", "wlan0", "CONNECTED"], check=True,
+                   env=dict(environment(), wireless_lan_supplicant=str(supplicants()[-1])))
+    assert wait_for(lambda: clients() and alive(clients()[-1]))
+    assert run("lnk-ifdown", "wlan0", wrap=wrap) == (0, b"", b"")
+    assert not alive(clients()[-1]) and running() == []
+    assert run("wireless-lan-auto", "--now", "wlan0", wrap=wrap)[0] == 0
+    assert wait_for(running)
+    assert run("wireless-lan-auto", "--stop", "wlan0", wrap=wrap)[0] == 0
+    assert running() == []
 
 
 def test_events_that_come_late_do_nothing():

@@ -117,12 +117,14 @@ def test_value_that_is_a_command_is_not_run():
 
 FORMS = {
     "dhcpcd": [b"--ipv4only", b"--noipv4ll", b"--nobackground", b"--quiet", b"--metric", b"600",
-               b"--timeout", b"45", b"wlan0"],
-    "udhcpc": [b"-f", b"-n", b"-R", b"-t", b"15", b"-T", b"3", b"-i", b"wlan0", b"-s",
+               b"--timeout", b"0", b"--nohook", b"resolv.conf", b"--env", b"wireless_lan_dns=auto",
+               b"--script", f"{machine.DEVICE}/dhcpcd-script".encode(), b"wlan0"],
+    "udhcpc": [b"-f", b"-t", b"5", b"-T", b"3", b"-A", b"5", b"-i", b"wlan0", b"-s",
                f"{machine.DEVICE}/udhcpc-script".encode()],
-    "dhclient": [b"-4", b"-d", b"-1", b"-lf", b"/run/dhclient.wlan0.leases", b"-pf",
-                 b"/run/dhclient.wlan0.pid", b"-e", b"IF_METRIC=600", b"-e",
-                 b"wireless_lan_dns=auto", b"wlan0"]}
+    "dhclient": [b"-4", b"-d", b"-cf", f"{STATE}/dhclient.conf".encode(), b"-lf",
+                 f"{STATE}/dhclient.leases".encode(), b"-pf", f"{STATE}/dhclient.pid".encode(),
+                 b"-e", b"IF_METRIC=600", b"-e", b"wireless_lan_dns=auto", b"-e",
+                 f"wireless_lan_names={machine.DEVICE}/name-servers".encode(), b"wlan0"]}
 
 
 @pytest.mark.parametrize("name", CLIENTS)
@@ -141,7 +143,7 @@ def test_client(name):
     assert b"address flush dev wlan0 scope global" in ip_calls()
 
 
-@pytest.mark.parametrize("name, told", [("dhcpcd", b"--nohook resolv.conf"),
+@pytest.mark.parametrize("name, told", [("dhcpcd", b"wireless_lan_dns=manual"),
                                         ("dhclient", b"wireless_lan_dns=manual")])
 def test_client_is_told_to_leave_the_name_servers(name, told):
     settings("iface wlan0\naddrtype dhcp\ndns manual\n" + GROUP)
@@ -179,7 +181,7 @@ def start_waiting():
 def test_client_that_gives_up():
     choose("ip", "udhcpc")
     note("client-fails")
-    assert run("lnk-ifup", "wlan0") == (1, b"", b"lnk-ifup: no address for wlan0\n")
+    assert run("lnk-ifup", "wlan0") == (1, b"", b"lnk-ifup: no address for wlan0 yet\n")
 
 
 def test_client_that_hands_over_to_its_daemon():
@@ -207,13 +209,17 @@ def test_one_that_waits_is_replaced_client_and_all(command, words):
     assert not alive(first)
 
 
-def test_lease_that_never_comes():
+def test_lease_that_comes_late():
+    """The command gives up, its client does not."""
     choose("ip", "udhcpc")
     waiting = start_waiting()
     client = clients()[-1]
     assert waiting.wait(120) == 1
+    assert read("/run/wireless-lan/reason") == b"no-lease\n"
+    assert alive(client)
+    assert run("lnk-ifdown", "wlan0")[0] == 0
     assert not alive(client)
-    assert sorted(os.listdir(STATE)) == ["addressed", "lock"], "no note of a process stays"
+    assert sorted(os.listdir(STATE)) == ["choice", "lock"], "no note of a process stays"
 
 
 @pytest.mark.parametrize("words", [(), ("wlan0", "x"), ("",), ("a/b",), ("-a",)])

@@ -9,8 +9,10 @@ import subprocess
 
 import pytest
 
+import joining
 import machine
-from machine import CLIENTS, GROUP, alive, read, run, settings, sh, start, static, wait_for, write
+from machine import (CLIENTS, GROUP, alive, choose, note, read, run, settings, sh, start, static,
+                     wait_for, write)
 
 
 def addresses(interface="wlan0"):
@@ -51,30 +53,43 @@ def real_files():
 
 
 @pytest.fixture
-def server():
-    """Networks of 10.7.N.0/24 at the other ends of wlan0, wlan1 and wlan2, with addresses to give;
-    the process that gives them."""
+def far():
+    """Networks at the other ends of wlan0, wlan1 and wlan2; how commands are run there."""
     holder = subprocess.Popen(["unshare", "-n", "sleep", "600"])
-    other = ["nsenter", "-n", "-t", str(holder.pid)]
+    inside = ["nsenter", "-n", "-t", str(holder.pid)]
     assert wait_for(lambda: os.readlink(f"/proc/{holder.pid}/ns/net") !=
                     os.readlink("/proc/self/ns/net"))
-    serve = [*other, "dnsmasq", "-k", "-C", "/dev/null", "-p", "0", "-u", "root", "-g", "root",
-             "--log-facility=-", f"--dhcp-leasefile={machine.ROOT}/leases",
-             f"--pid-file={machine.ROOT}/dnsmasq.pid"]
     for number in range(3):
         end = f"server{number}"
         sh("ip", "link", "add", f"wlan{number}", "type", "veth", "peer", "name", end)
         sh("ip", "link", "set", end, "netns", str(holder.pid))
-        sh(*other, "ip", "address", "add", f"10.7.{number}.1/24", "dev", end)
-        sh(*other, "ip", "link", "set", end, "up")
-        serve += ["-i", end, f"--dhcp-range=set:{end},10.7.{number}.50,10.7.{number}.60,2m",
-                  f"--dhcp-option=tag:{end},6,10.7.{number}.1"]
-    process = subprocess.Popen(serve, stderr=subprocess.DEVNULL)
+        sh(*inside, "ip", "link", "set", end, "up")
+    yield inside
+    holder.kill()
+    holder.wait()
+
+
+def serve(far, *networks):
+    """A server of addresses of these networks, such as 10.7.0, each at the next interface."""
+    command = [*far, "dnsmasq", "-k", "-C", "/dev/null", "-p", "0", "-u", "root", "-g", "root",
+               "--log-facility=-", f"--dhcp-leasefile={machine.ROOT}/leases",
+               f"--pid-file={machine.ROOT}/dnsmasq.pid"]
+    for number, network in enumerate(networks):
+        end = f"server{number}"
+        sh(*far, "ip", "address", "flush", "dev", end)
+        sh(*far, "ip", "address", "add", f"{network}.1/24", "dev", end)
+        command += ["-i", end, f"--dhcp-range=set:{end},{network}.50,{network}.60,2m",
+                    f"--dhcp-option=tag:{end},6,{network}.1"]
+    return subprocess.Popen(command, stderr=subprocess.DEVNULL)
+
+
+@pytest.fixture
+def server(far):
+    """Networks of 10.7.N.0/24, with addresses to give; the process that gives them."""
+    process = serve(far, "10.7.0", "10.7.1", "10.7.2")
     yield process
     process.terminate()
     process.wait(20)
-    holder.kill()
-    holder.wait()
 
 
 @pytest.mark.parametrize("dns, wanted", [("auto", b"10.7.0.1"), ("manual", b"192.0.2.53")])
@@ -98,14 +113,25 @@ def test_lease(name, dns, wanted, server):
     assert addresses().count(b"inet ") == 1
     assert b"10.7.0.9/24" in addresses()
     assert wait_for(lambda: not left(name))
+    assert read("/etc/resolv.conf") == b"nameserver 192.0.2.53\n"
     assert run("lnk-ifdown", "wlan0")[0] == 0
     assert addresses() == b""
     assert b"wlan0" not in routes()
+    assert read("/etc/resolv.conf") == b"nameserver 192.0.2.53\n"
+
+
+def start_everyone():
+    """The clients, each on an interface of its own, at the same time."""
+    waiting = []
+    for number, name in enumerate(CLIENTS):
+        install_client(name)
+        waiting.append((name, f"wlan{number}", start("lnk-ifup", f"wlan{number}")))
+        assert wait_for(lambda: left(name))
+    return waiting
 
 
 def test_no_server(server):
-    """A client makes no address up, and takes no old lease for a new one. Each on an interface of
-    its own, all at once: giving up takes its time."""
+    """A client makes no address up, takes no old lease for a new one, and goes on asking."""
     for number, name in enumerate(CLIENTS):
         install_client(name)
         assert run("lnk-ifup", f"wlan{number}")[0] == 0
@@ -113,12 +139,108 @@ def test_no_server(server):
         assert wait_for(lambda: not left(name))
     server.terminate()
     server.wait(20)
-    waiting = []
-    for number, name in enumerate(CLIENTS):
-        install_client(name)
-        waiting.append((name, f"wlan{number}", start("lnk-ifup", f"wlan{number}")))
-        assert wait_for(lambda: left(name))
-    for name, interface, process in waiting:
+    for name, interface, process in start_everyone():
         assert process.wait(120) == 1
         assert addresses(interface) == b""
+        assert left(name), name
+
+
+def test_server_that_is_away_for_longer_than_a_lease(far):
+    """The address goes with its lease, and comes with its server."""
+    def give():
+        given = []
+        for number in range(3):
+            path = f"{machine.ROOT}/udhcpd{number}"
+            write(path, f"interface server{number}\nstart 10.7.{number}.50\nend 10.7.{number}.60\n"
+                        f"option subnet 255.255.255.0\noption lease 20\nmin_lease 20\n"
+                        f"lease_file {path}.leases\npidfile {path}.pid\n")
+            write(f"{path}.leases", "")
+            given.append(subprocess.Popen([*far, "busybox", "udhcpd", "-f", path],
+                                          stderr=subprocess.DEVNULL))
+        return given
+    for number in range(3):
+        sh(*far, "ip", "address", "add", f"10.7.{number}.1/24", "dev", f"server{number}")
+    servers = give()
+    for name, _, process in start_everyone():
+        assert process.wait(60) == 0, name
+    for process in servers:
+        process.kill()
+        process.wait()
+    for number, name in enumerate(CLIENTS):
+        assert wait_for(lambda: addresses(f"wlan{number}") == b"", 90), name
+    give()
+    for number, name in enumerate(CLIENTS):
+        assert wait_for(lambda: b"inet 10.7." in addresses(f"wlan{number}"), 90), name
+
+
+@pytest.mark.parametrize("name", CLIENTS)
+def test_another_subnet_under_the_same_name(name, far):
+    """A new association asks anew: the old address would reach nobody."""
+    choose("wpa_supplicant", "wpa_cli", "iw")
+    note("status", joining.CONNECTED)
+    install_client(name)
+    process = serve(far, "10.7.0")
+    assert joining.iwset("Home")[0] == 0
+    assert run("lnk-ifup", "wlan0")[0] == 0
+    assert b"inet 10.7.0." in addresses()
+    process.terminate()
+    process.wait(20)
+    process = serve(far, "10.8.0")
+    subprocess.run([f"{machine.DEVICE}/wpa-action", "wlan0", "CONNECTED"], check=True, env=dict(
+        machine.environment(), wireless_lan_supplicant=str(machine.supplicants()[-1])))
+    assert wait_for(lambda: b"inet 10.8.0." in addresses() and b"10.7.0." not in addresses())
+    process.terminate()
+    process.wait(20)
+
+
+def test_lease_is_given_back(far):
+    """So that it is free for the next one; and only while its network is there."""
+    for name in CLIENTS:
+        process = serve(far, "10.7.0")
+        install_client(name)
+        assert run("lnk-ifup", "wlan0")[0] == 0
+        assert run("lnk-ifdown", "wlan0")[0] == 0
+        assert wait_for(lambda: read(f"{machine.ROOT}/leases").count(b"10.7.0.") == 0), name
+        process.terminate()
+        process.wait(20)
+
+
+def test_clients_of_others_are_ended(server):
+    """They would set their address again, beside the one that is wanted."""
+    static("10.7.0.9", "255.255.255.0", "10.7.0.255", "10.7.0.1")
+    for name, words in (("dhclient", ["-d", "-lf", "/run/l", "-pf", "/run/p"]),
+                        ("udhcpc", ["-f", "-i"]), ("dhcpcd", ["-B", "-4"])):
+        install_client(name)
+        subprocess.Popen([name, *words, "wlan0"], stdout=subprocess.DEVNULL,
+                         stderr=subprocess.DEVNULL)
+        assert wait_for(lambda: left(name))
+        if name != "udhcpc":
+            assert wait_for(lambda: re.search(rb"10\.7\.0\.[56]", addresses())), name
+        status, _, err = run("lnk-ifup", "wlan0")
+        assert (status, err) == (
+            0, f"lnk-ifup: another DHCP client on wlan0 has been ended: {name}\n".encode())
         assert wait_for(lambda: not left(name))
+        assert addresses().count(b"inet ") == 1 and b"10.7.0.9/24" in addresses()
+
+
+# ---- what the kernel learns by itself
+
+
+def addresses6():
+    return subprocess.run(["ip", "-6", "-o", "address", "show", "dev", "wlan0"],
+                          stdout=subprocess.PIPE, check=True).stdout
+
+
+@pytest.mark.parametrize("command, words", [
+    ("lnk-ifdown", ["wlan0"]), ("iwset", joining.arguments("x"))])
+def test_ipv6_of_the_old_network_goes(command, words, far):
+    choose("wpa_supplicant", "wpa_cli", "iw")
+    note("status", joining.CONNECTED)
+    sh("ip", "link", "set", "wlan0", "up")
+    sh("ip", "-6", "address", "add", "2001:db8::5/64", "dev", "wlan0", "nodad")
+    sh("ip", "-6", "route", "add", "default", "via", "fe80::1", "dev", "wlan0", "proto", "ra")
+    assert run(command, *words)[0] == 0
+    assert b"2001:db8" not in addresses6()
+    assert b"default" not in subprocess.run(["ip", "-6", "route"], stdout=subprocess.PIPE,
+                                            check=True).stdout
+    assert wait_for(lambda: b"fe80:" in addresses6()), "the next network's routers are asked"

@@ -1,0 +1,63 @@
+# shellcheck shell=sh
+# SPDX-License-Identifier: MIT
+# How the interface loses what it got in a network: its lease, its addresses, its name servers.
+# "$interface", "$library" and "$state" are those of wireless-lan.sh.
+# shellcheck disable=SC2154
+
+# stop_client: ends our DHCP client, without a word to the server (the network that the lease came
+# from may be gone), and the server of a network that is hosted here.
+stop_client() {
+    stop_process lnk-ifup.pid
+    stop_process dhcp.pid
+    stop_process dnsmasq.pid
+    if [ -f "$state/dhcpcd" ]; then
+        # It was handed to a dhcpcd that serves other interfaces as well.
+        limited 5 dhcpcd -x "$interface" >/dev/null 2>&1
+        rm -f "$state/dhcpcd"
+    fi
+}
+
+# release_lease: gives the lease back while the network is there.
+release_lease() {
+    runs dhcp.pid || return 0
+    client=
+    { read -r client <"/proc/$pid/comm"; } 2>/dev/null
+    case $client in
+    # It sends the message and goes on waiting.
+    udhcpc | busybox) kill -USR2 "$pid" 2>/dev/null ;;
+    # It leaves after the message.
+    dhcpcd)
+        kill -ALRM "$pid" 2>/dev/null
+        tries=50
+        while [ "$tries" -gt 0 ] && runs dhcp.pid; do
+            sleep 0.1
+            tries=$((tries - 1))
+        done
+        ;;
+    dhclient)
+        limited 5 dhclient -4 -r -lf "$state/dhclient.leases" -pf "$state/dhclient.pid" \
+            "$interface" >/dev/null 2>&1
+        ;;
+    esac
+}
+
+# drop_address: ends what gets an address, or tries to, and empties the addresses.
+drop_address() {
+    stop_client
+    ip -4 address flush dev "$interface" 2>/dev/null
+    "${library%/*}/name-servers" drop "$interface"
+}
+
+# forget_ipv6: the addresses, routes and name servers that the kernel learnt from the routers of a
+# network that is being left. It asks the next network's routers anew.
+forget_ipv6() {
+    switch=/proc/sys/net/ipv6/conf/$interface/disable_ipv6
+    disabled=
+    { read -r disabled <"$switch"; } 2>/dev/null
+    [ "$disabled" = 0 ] || return 0
+    if { echo 1 >"$switch" && echo 0 >"$switch"; } 2>/dev/null; then
+        return 0
+    fi
+    ip -6 address flush dev "$interface" scope global 2>/dev/null
+    ip -6 route flush dev "$interface" 2>/dev/null
+}

@@ -1,0 +1,187 @@
+# SPDX-License-Identifier: MIT
+"""The preferred networks joined in their order, without and against the user's hand.
+
+The machine has no systemd: wireless-lan-auto is started as an init script or inittab does."""
+
+import os
+import re
+import shutil
+import signal
+import time
+
+import air
+import window as w
+from air import network, run
+from probe import wait_until
+from steps import check, connected_to, linked, press_button, press_connect, same, wanted_row
+
+FIRST = network(b"First", key="the first key", net=1)
+SECOND = network(b"Second", key="second to none", net=2)
+THIRD = network(b"Third", net=3)
+FOURTH = network(b"Fourth", net=4)
+STATIONS = {"02:00:00:00:01:00": "First", "02:00:00:00:02:00": "Second",
+            "02:00:00:00:03:00": "Third", "02:00:00:00:03:01": "Fourth"}
+STATE = "/run/wireless-lan/wlan0"
+LIST = "user_cell_list_front"
+RECORD = ("USERCELL {0}\nALIAS {1}\nESSID {1}\nMODE Master\nKMGMT {2}\nKINDEX 0\nEncryption {3}\n"
+          "KEY {4}\n")
+
+
+def prepare():
+    air.radios(5)
+    air.access_point(2, 6, [SECOND])
+    air.access_point(3, 11, [THIRD, FOURTH])
+    air.addresses(1, 2, 3, 4)
+    with open("/etc/wireless-user.conf", "w") as file:
+        for number, one in enumerate((FIRST, SECOND, THIRD)):
+            key = one["key"]
+            file.write(RECORD.format(number, one["name"].decode(), int(bool(key)),
+                                     "open" if key else "off", key or "off"))
+
+
+def where():
+    """The network that the kernel is associated with."""
+    return STATIONS.get(linked())
+
+
+def address():
+    found = re.search(r"inet 10\.9\.(\d+)\.", run("ip", "-4", "addr", "show", "dev", "wlan0"))
+    return int(found.group(1)) if found else None
+
+
+def supplicant():
+    """The number of the supplicant, and when it began, in seconds since the machine did."""
+    with open(f"{STATE}/supplicant.pid") as file:
+        number, ticks = file.read().split()
+    return int(number), int(ticks) / os.sysconf("SC_CLK_TCK")
+
+
+def start_of_the_machine(net, what):
+    """The automatic as the machine's start has it; tells how long an address takes."""
+    run("wireless-lan-auto", "--daemon", "wlan0")
+    wait_until(lambda: address() == net, lambda: f"an address of {net}, there is {address()}", 120)
+    with open("/proc/uptime") as file:
+        taken = float(file.read().split()[0]) - supplicant()[1]
+    print(f"auto: {what}: {taken:.1f} s from the supplicant's start to an address")
+
+
+def end_of_the_machine():
+    """What a machine that is switched off leaves of itself: nothing under /run."""
+    for entry in os.listdir(STATE):
+        if entry.endswith(".pid"):
+            with open(f"{STATE}/{entry}") as file:
+                try:
+                    os.kill(int(file.read().split()[0]), signal.SIGKILL)
+                except ProcessLookupError:
+                    pass
+    shutil.rmtree("/run/wireless-lan")
+    run("ip", "link", "set", "wlan0", "down")
+    run("ip", "addr", "flush", "dev", "wlan0")
+
+
+def chosen_by():
+    return run("wireless-lan-auto", "--status", "wlan0", check=False).split()[-1]
+
+
+def the_second_is_joined_when_the_first_is_not_there():
+    start_of_the_machine(2, "boot")
+    same(where(), "Second", "the network")
+
+
+def the_window_shows_it_connected():
+    w.begin()
+    w.idle()
+    w.refresh_until(lambda now: any(one[0] == "Second" and one[4].startswith("Connected\n")
+                                    for one in now), "the second is shown as connected")
+    row = w.connected_row(2)
+    same((w.rows()[row][0], address()), ("Second", 2), "the connected row and the address")
+    w.select(row)
+    wait_until(lambda: w.app.label("button-connect") == "gtk-disconnect", "the button")
+    w.photograph("joined-by-itself")
+
+
+def the_second_goes_away_and_the_third_is_joined():
+    begun = time.monotonic()
+    air.switch_off(2)
+    wait_until(lambda: address() == 3, lambda: f"an address of 3, there is {address()}", 120)
+    print(f"auto: loss: {time.monotonic() - begun:.1f} s until the next network's address")
+    same(where(), "Third", "the network")
+
+
+def the_first_appears_and_nothing_changes():
+    air.access_point(1, 1, [FIRST])
+    for _ in range(3):
+        w.refresh_until(lambda now: "First" in [one[0] for one in now], "the first is listed")
+        w.refresh()
+        same(where(), "Third", "the network")
+
+
+def a_network_joined_by_hand_stays():
+    before = supplicant()[0]
+    press_connect("Fourth")
+    connected_to(4)
+    same(chosen_by(), "hand", "who has chosen")
+    check(supplicant()[0] != before, "the automatic's supplicant is still there")
+    for _ in range(4):
+        w.refresh()
+        same((where(), address()), ("Fourth", 4), "the network and the address")
+    same(len(run("pidof", "wpa_supplicant").split()), 1, "the number of supplicants")
+
+
+def after_a_disconnect_nothing_is_joined():
+    w.select(wanted_row("Fourth"))
+    press_button("gtk-disconnect")
+    wait_until(lambda: not linked(), "the interface to be left", 30)
+    for _ in range(4):
+        w.refresh()
+        same((where(), address()), (None, None), "the network and the address")
+    same(chosen_by(), "off", "who has chosen")
+
+
+def a_new_start_of_the_machine_joins_the_second_again():
+    air.switch_off(1)
+    end_of_the_machine()
+    air.access_point(2, 6, [SECOND])
+    start_of_the_machine(2, "second boot")
+
+
+def the_order_of_the_window_is_taken_over():
+    air.access_point(1, 1, [FIRST])
+    before = supplicant()[0]
+    w.app.press("button-network-configure")
+    box = w.app.dialog("Preferred Network Setting")
+    box.click_row(LIST, 2)
+    wait_until(lambda: box.selected(LIST) == [2], "the third to be selected")
+    for _ in range(2):
+        box.press("gtk-go-up")
+    wait_until(lambda: [row[0] for row in box.rows(LIST)][0] == "Third", "the third to be first")
+    w.photograph("reordered")
+    box.press("gtk-ok")
+    box.wait_gone()
+    wait_until(lambda: os.path.exists(f"{STATE}/next.conf"), "the list to be noticed", 60)
+    same((where(), address(), supplicant()[0]), ("Second", 2, before), "the connection")
+    w.refresh_until(lambda now: "First" in [one[0] for one in now], "the first is in reach")
+    air.switch_off(2)
+    wait_until(lambda: address() == 3, lambda: f"an address of 3, there is {address()}", 120)
+    same(where(), "Third", "the network, with the first in reach,")
+
+
+def an_address_comes_back_with_the_network():
+    air.switch_off(3)
+    air.switch_off(1)
+    wait_until(lambda: address() is None, "the address to go", 60)
+    air.access_point(3, 11, [THIRD, FOURTH])
+    wait_until(lambda: address() == 3, lambda: f"an address of 3, there is {address()}", 120)
+
+
+SCENARIOS = [
+    the_second_is_joined_when_the_first_is_not_there,
+    the_window_shows_it_connected,
+    the_second_goes_away_and_the_third_is_joined,
+    the_first_appears_and_nothing_changes,
+    a_network_joined_by_hand_stays,
+    after_a_disconnect_nothing_is_joined,
+    a_new_start_of_the_machine_joins_the_second_again,
+    the_order_of_the_window_is_taken_over,
+    an_address_comes_back_with_the_network,
+]
