@@ -145,17 +145,8 @@ static string valid(const string &text)
     return made;
 }
 
-// At most `limit` characters, as an entry takes them.
-static string characters(const string &text, glong limit)
-{
-    if (g_utf8_strlen(text.c_str(), -1) <= limit)
-        return text;
-    return string(text.c_str(),
-                  static_cast<const char *>(g_utf8_offset_to_pointer(text.c_str(), limit)));
-}
-
-// At most 127 bytes, no part of a character at the end, as a record takes them. Only long texts are
-// cut here, and those are valid.
+// At most 127 bytes, no part of a character at the end, as entries and records take them. Only long
+// texts are cut here, and those are valid.
 static string field(const string &text)
 {
     const gchar *end = text.c_str() + 127;
@@ -408,7 +399,7 @@ static void check_form()
 
 static void enter(const char *key, string &value)
 {
-    value = characters(some_text(TRUE), 127);
+    value = field(some_text(TRUE));
     note("%s:=%s", key, value.c_str());
     gtk_entry_set_text(GTK_ENTRY(find_widget(key)), value.c_str());
 }
