@@ -21,6 +21,9 @@ def _bytes_back(value):
     return value
 
 
+EDGE = 3  # pixels of a scrolled window's shadow, which takes no press
+
+
 class Widget(dict):
     """One widget as it was when the tree was read: type, name, text, label, sensitive, usable
     (sensitive with all its parents), visible, mapped, rect, focus, default, active, items ..."""
@@ -171,32 +174,41 @@ class Pane:
         self.app.display.click(x + width // 2, y + height // 2, button, count)
         return widget
 
+    def _now(self, widget):
+        """The record of a widget as it is now."""
+        return next(one for one in self.tree().walk() if one["id"] == widget["id"])
+
     def _scroll_to(self, find, widget):
-        """Turns the wheel over the scroll bars around a widget until its middle is in sight; gives
-        whether there was anything to do."""
+        """Turns the wheel over the scroll bars around `widget` until the middle of what `find`
+        gives, in it, is in sight; gives whether there was anything to do."""
         moved = False
-        child = widget
-        while child is not None:
-            frame = child.parent
-            if child["type"] == "GtkViewport" and frame["type"] == "GtkScrolledWindow":
+        while widget is not None:
+            frame = widget.parent
+            if widget["type"] == "GtkViewport" and frame["type"] == "GtkScrolledWindow":
                 for axis, bar in enumerate(("GtkHScrollbar", "GtkVScrollbar")):
-                    moved |= self._scroll(find, child, frame, axis, bar)
-            child = frame
+                    moved |= self._scroll(find, widget, axis, bar)
+            widget = frame
         return moved
 
-    def _scroll(self, find, viewport, frame, axis, kind):
-        moved = False
+    def _scroll(self, find, viewport, axis, kind):
+        turns = []
         while True:
             rect = find()["rect"]
             middle = rect[axis] + rect[axis + 2] // 2
+            viewport = self._now(viewport)
             low, size = viewport["rect"][axis], viewport["rect"][axis + 2]
-            if low < middle < low + size:
-                return moved
-            bar, = [one for one in frame["children"] if one["type"] == kind]
+            if low + EDGE < middle < low + size - EDGE:
+                return bool(turns)
+            # A step may lead past what is in sight at once.
+            turn = 5 if middle > low + EDGE else 4
+            assert turns[-4:] != [turn, 9 - turn] * 2, f"{find()['name']} does not come into sight"
+            bar, = [one for one in viewport.parent["children"] if one["type"] == kind]
             assert bar["mapped"], f"{find()['name']} is out of sight, with no {kind} to it"
+            self._scroll_to(lambda: self._now(bar), bar.parent)
+            rect, bar = find()["rect"], self._now(bar)
             x, y, width, height = bar["rect"]
-            self.app.display.click(x + width // 2, y + height // 2, 5 if middle > low else 4)
-            moved = True
+            self.app.display.click(x + width // 2, y + height // 2, turn)
+            turns.append(turn)
             wait_until(lambda: find()["rect"] != rect, f"{find()['name']} to come into sight")
 
     def _in_place(self, find, place, what, limit=LIMIT):
@@ -260,17 +272,12 @@ class Pane:
         self.app.display.click(x + min(width, 40) // 2, y + height // 2, button, count)
 
     def _reach(self, name, row, column):
-        """Turns the wheel until the row is in sight."""
-        frame = self.find(name)
-        while frame is not None and frame["type"] != "GtkScrolledWindow":
-            frame = frame.parent
-        while frame is not None:
-            left, top, width, height = frame["rect"]
-            _, y, _, cell_height = self.cell(name, row, column)
-            if y >= top and y + cell_height <= top + height:
-                return
-            self.app.display.click(left + width // 2, top + height // 2, 5 if y > top else 4)
-            wait_until(lambda: self.cell(name, row, column)[1] != y, f"{name} to scroll to {row}")
+        """Turns the wheel until the row, near its left edge, is in sight."""
+        def place():
+            x, y, width, height = self.cell(name, row, column)
+            return {"name": name, "rect": [x, y, min(width, 40), height]}
+
+        self._scroll_to(place, self.find(name))
 
 
 class Program(Pane):
