@@ -2,6 +2,9 @@
 
 #include <initializer_list>
 
+#include <glib/gi18n.h>
+
+#include "base/work_area.h"
 #include "wifi_info/text.h"
 
 static void run_message(GtkWidget *parent, GtkDialogFlags flags, GtkButtonsType buttons,
@@ -10,8 +13,11 @@ static void run_message(GtkWidget *parent, GtkDialogFlags flags, GtkButtonsType 
     GtkWidget *dialog = begin_dialog(gtk_message_dialog_new(
         GTK_WINDOW(parent), flags, GTK_MESSAGE_INFO, buttons, "%s", message));
 
+    // For the task bar.
+    gtk_window_set_title(GTK_WINDOW(dialog), _("Wireless LAN"));
     if (explanation != nullptr)
         gtk_message_dialog_format_secondary_text(GTK_MESSAGE_DIALOG(dialog), "%s", explanation);
+    show_dialog(dialog);
     gtk_dialog_run(GTK_DIALOG(dialog));
     end_dialog(dialog);
 }

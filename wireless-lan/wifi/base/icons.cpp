@@ -40,3 +40,58 @@ void use_built_in_icons()
     gtk_icon_theme_set_search_path(theme, nullptr, 0);
     g_signal_connect(settings, "notify::gtk-icon-theme-name", G_CALLBACK(cb_theme_named), nullptr);
 }
+
+// The picture of data/wireless-lan.svg, in quarters of its 48 units: what covers a point.
+enum cover { NOTHING, GROUND, SIGN };
+
+constexpr int ICON_SIZE = 48;
+constexpr int SUB = 4; // points along each side of a pixel
+
+static cover cover_at(int x, int y)
+{
+    const int edge = 2 * SUB;
+    const int corner = 9 * SUB;
+    const int far_x = MAX(MAX(edge + corner - x, x - (ICON_SIZE * SUB - edge - corner)), 0);
+    const int far_y = MAX(MAX(edge + corner - y, y - (ICON_SIZE * SUB - edge - corner)), 0);
+    const int across = ABS(x - 24 * SUB);
+    const int above = 35 * SUB - y;
+    const int distance = across * across + above * above;
+    const auto between = [distance](int inner, int outer) {
+        return distance >= inner * inner && distance <= outer * outer;
+    };
+
+    if (far_x * far_x + far_y * far_y > corner * corner)
+        return NOTHING;
+    if (between(0, 14) || (above > across && (between(42, 58) || between(76, 92))))
+        return SIGN;
+    return GROUND;
+}
+
+static void draw_pixel(int column, int row, guchar *pixel)
+{
+    static const guchar ground[] = {0x55, 0x6B, 0x2F};
+    int covered = 0;
+    int white = 0;
+
+    for (int i = 0; i < SUB * SUB; i++) {
+        const cover found = cover_at(column * SUB + i % SUB, row * SUB + i / SUB);
+
+        covered += found != NOTHING;
+        white += found == SIGN;
+    }
+    for (int channel = 0; channel < 3; channel++)
+        pixel[channel] =
+            static_cast<guchar>(ground[channel] + (0xFF - ground[channel]) * white / (SUB * SUB));
+    pixel[3] = static_cast<guchar>(0xFF * covered / (SUB * SUB));
+}
+
+void use_program_icon()
+{
+    g_autoptr(GdkPixbuf) icon = gdk_pixbuf_new(GDK_COLORSPACE_RGB, TRUE, 8, ICON_SIZE, ICON_SIZE);
+
+    for (int i = 0; i < ICON_SIZE * ICON_SIZE; i++)
+        draw_pixel(i % ICON_SIZE, i / ICON_SIZE,
+                   gdk_pixbuf_get_pixels(icon) + i / ICON_SIZE * gdk_pixbuf_get_rowstride(icon) +
+                       4 * (i % ICON_SIZE));
+    gtk_window_set_default_icon(icon);
+}

@@ -10,4 +10,7 @@
 // after gtk_init and before the first icon.
 void use_built_in_icons();
 
+// Gives every window the program's icon, drawn here so that no file and no theme is needed for it.
+void use_program_icon();
+
 #endif

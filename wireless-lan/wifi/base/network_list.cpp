@@ -3,6 +3,7 @@
 #include <glib/gi18n.h>
 
 #include "base/controls.h"
+#include "base/list_keyboard.h"
 #include "base/registry.h"
 #include "base/state.h"
 #include "wifi.h"
@@ -61,4 +62,5 @@ void review_tree_vanpro(const gchar *data)
         cell->linkstate = connected ? 1 : 2;
         model_data_new(store, cell->essid, cell->mode, cell->key, cell->quality, cell->state);
     }
+    highlight_chosen_row();
 }

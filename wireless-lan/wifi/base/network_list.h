@@ -16,8 +16,8 @@ gchar *connected_state(const char *address);
 void clear_network_list();
 
 // Fills the list afresh from the scanned networks: `data` (up to 127 bytes) is the state of the
-// network at connect_index, every other one is disconnected. Nothing is selected afterwards. While
-// a refresh is under way the list stays empty: the records are about to be replaced.
+// network at connect_index, every other one is disconnected. The chosen network is highlighted
+// again. While a refresh is under way the list stays empty: the records are about to be replaced.
 void review_tree_vanpro(const gchar *data);
 
 #endif

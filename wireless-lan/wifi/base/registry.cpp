@@ -1,5 +1,7 @@
 #include "base/registry.h"
 
+#include <cstring>
+
 #include "base/state.h"
 
 static void cb_forget_widget(GtkWidget *widget, gpointer key)
@@ -43,7 +45,8 @@ void set_title_label(const gchar *text)
 {
     GtkWidget *label = find_widget(TITLE_LABEL);
 
-    if (label != nullptr)
+    // A text that stands there already is not announced a second time.
+    if (label != nullptr && strcmp(gtk_label_get_text(GTK_LABEL(label)), text) != 0)
         gtk_label_set_text(GTK_LABEL(label), text);
 }
 

@@ -6,10 +6,12 @@
 
 #include <glib/gi18n.h>
 
+#include "base/accessible.h"
 #include "base/dialogs.h"
 #include "base/entries.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
@@ -306,11 +308,15 @@ static GtkWidget *attach_frame(GtkWidget *table, const gchar *title, guint row)
     return box;
 }
 
-// Fills the rest of `box` with a combo; one that could not be built is left out.
-static void pack_combo(GtkWidget *box, GtkWidget *combo)
+// Fills the rest of `box` with a combo; one that could not be built is left out. `name` is read out
+// for it; NULL: a label names it.
+static void pack_combo(GtkWidget *box, GtkWidget *combo, const gchar *name)
 {
-    if (combo != invalid_widget())
-        gtk_box_pack_start(GTK_BOX(box), combo, TRUE, TRUE, 0);
+    if (combo == invalid_widget())
+        return;
+    if (name != nullptr)
+        name_for_ears(combo, name);
+    gtk_box_pack_start(GTK_BOX(box), combo, TRUE, TRUE, 0);
 }
 
 static void attach_notice(GtkWidget *table)
@@ -319,6 +325,7 @@ static void attach_notice(GtkWidget *table)
         gtk_image_new_from_stock(GTK_STOCK_DIALOG_AUTHENTICATION, GTK_ICON_SIZE_DIALOG);
     GtkWidget *label = gtk_label_new(_("Encrypted Network,Please enter the key."));
 
+    hide_from_ears(image);
     gtk_table_attach(GTK_TABLE(table), image, 0, 1, 0, 1, GTK_FILL, GTK_FILL, PADDING, PADDING);
     gtk_label_set_line_wrap(GTK_LABEL(label), TRUE);
     gtk_misc_set_alignment(GTK_MISC(label), 0, 0.5);
@@ -330,14 +337,23 @@ static void pack_key(GtkWidget *box, GtkWidget *entry, GtkWidget *index)
     GtkWidget *index_box = gtk_hbox_new(FALSE, 0);
     GtkWidget *label = gtk_label_new(_(" Key index: "));
 
-    gtk_widget_set_size_request(entry, 280, 30);
+    name_for_ears(entry, _("Key"));
+    request_at_least(entry, 280, 30);
     gtk_widget_set_size_request(index_box, 120, 30);
     gtk_box_pack_start(GTK_BOX(box), entry, TRUE, TRUE, 0);
     gtk_box_pack_start(GTK_BOX(box), index_box, FALSE, FALSE, 0);
     gtk_box_pack_start(GTK_BOX(index_box), label, FALSE, FALSE, 0);
-    pack_combo(index_box, index);
+    pack_combo(index_box, index, nullptr);
     if (index != invalid_widget()) {
-        gtk_widget_set_size_request(index, 40, 30);
+        GtkRequisition words, needs;
+
+        // The designed sizes stand while they hold the texts.
+        gtk_widget_size_request(label, &words);
+        gtk_widget_size_request(index, &needs);
+        needs.height = MAX(30, needs.height);
+        gtk_widget_set_size_request(index, 40, needs.height);
+        gtk_widget_set_size_request(
+            index_box, words.width + 40 > 120 ? words.width + needs.width : 120, needs.height);
         gtk_label_set_mnemonic_widget(GTK_LABEL(label), index);
     }
 }
@@ -379,6 +395,7 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     forget_stored_key();
 
     GtkWidget *dialog = create_dialog_window();
+    g_autofree gchar *network = displayable(sought_essid);
     GtkWidget *table = gtk_table_new(4, 2, FALSE);
     GtkWidget *authentication = create_Authentication_ComboBox();
     GtkWidget *preferred = create_ComboBox(match_count);
@@ -386,11 +403,12 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     GtkWidget *index = create_Key_Index_ComboBox();
 
     debug_line("create_ComboBox match_count=%d", *match_count);
+    describe_for_ears(dialog, network);
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
     gtk_container_add(GTK_CONTAINER(gtk_dialog_get_content_area(GTK_DIALOG(dialog))), table);
     attach_notice(table);
-    pack_combo(attach_frame(table, _("Authentication"), 1), authentication);
-    pack_combo(attach_frame(table, _("Preferred Network"), 2), preferred);
+    pack_combo(attach_frame(table, _("Authentication"), 1), authentication, _("Authentication"));
+    pack_combo(attach_frame(table, _("Preferred Network"), 2), preferred, _("Preferred Network"));
     pack_key(attach_frame(table, _("Key"), 3), entry, index);
 
     if (authentication != invalid_widget())

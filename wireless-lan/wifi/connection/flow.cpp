@@ -8,9 +8,11 @@
 #include "base/controls.h"
 #include "base/desktop.h"
 #include "base/dialogs.h"
+#include "base/list_keyboard.h"
 #include "base/network_list.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "connection/add_to_preferred.h"
 #include "connection/chosen_network.h"
 #include "connection/commands.h"
@@ -153,7 +155,7 @@ static void connect_encrypted(WIFI_CELL *chosen)
     int match_count = 0;
     GtkWidget *dialog = begin_dialog(create_encrypted_dialog(&match_count));
 
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
         read_answers(chosen);
 
@@ -254,6 +256,8 @@ static void follow_pointer(GtkTreeView *view, const GdkEventButton *event)
 
 gboolean cb_view_sel(GtkWidget *widget, GdkEventButton *event, void *)
 {
+    // The toolkit would select the first row when it gives the list the focus.
+    focus_list(widget);
     if (!(my_wifi->cell_count > 0 && my_wifi->interface_count > 0)) {
         log_critical("cb_view_sel", "my_wifi->cell_count>0&&my_wifi->interface_count>0");
         return FALSE;

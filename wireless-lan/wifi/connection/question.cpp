@@ -1,7 +1,10 @@
 #include "connection/question.h"
 
+#include <glib/gi18n.h>
+
 #include "base/dialogs.h"
 #include "base/entries.h"
+#include "base/work_area.h"
 
 static void cb_text_changed(GtkEntry *entry, gpointer dialog)
 {
@@ -27,13 +30,14 @@ gchar *ask_text(GtkWidget *parent, const gchar *message, const gchar *label, ent
     gtk_box_pack_start(GTK_BOX(box), entry, TRUE, TRUE, 0);
     gtk_container_set_border_width(GTK_CONTAINER(box), 5);
     gtk_box_pack_end(GTK_BOX(content), box, FALSE, FALSE, 0);
+    gtk_window_set_title(GTK_WINDOW(dialog), _("Wireless LAN"));
     gtk_entry_set_activates_default(GTK_ENTRY(entry), TRUE);
     if (enter == ENTER_ANSWERS)
         gtk_dialog_set_default_response(GTK_DIALOG(dialog), GTK_RESPONSE_YES);
     else
         g_signal_connect(entry, "changed", G_CALLBACK(cb_text_changed), dialog);
     gtk_widget_grab_focus(entry);
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_YES)
         answer = g_strdup(gtk_entry_get_text(GTK_ENTRY(entry)));
     end_dialog(dialog);

@@ -3,6 +3,7 @@
 #include <cstdio>
 
 #include "base/dialogs.h"
+#include "base/work_area.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"
@@ -45,7 +46,7 @@ void cb_configuration_add(GtkWidget *, gpointer data)
         begin_dialog(create_network_dialog(add_form, static_cast<GtkWidget *>(data)));
 
     connect_network_form(add_form);
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && !add_network(dialog)) {
     }
     end_dialog(dialog);

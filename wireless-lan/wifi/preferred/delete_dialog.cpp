@@ -2,8 +2,10 @@
 
 #include <glib/gi18n.h>
 
+#include "base/accessible.h"
 #include "base/dialogs.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "preferred/store.h"
 #include "wifi.h"
 
@@ -30,6 +32,7 @@ static GtkWidget *create_delete_dialog(GtkWidget *parent, const gchar *name)
     gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
 
     gtk_container_set_border_width(GTK_CONTAINER(table), 5);
+    hide_from_ears(image);
     gtk_table_attach(GTK_TABLE(table), image, 0, 1, 1, 2, GTK_FILL, GTK_FILL, 5, 5);
     gtk_table_attach_defaults(GTK_TABLE(table), label, 1, 2, 1, 2);
     pack_content(dialog, table);
@@ -56,7 +59,7 @@ void cb_configuration_delete(GtkWidget *, gpointer data)
     GtkWidget *dialog =
         begin_dialog(create_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
 
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     // Looked up afresh: rows can go while the question stands.
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
         row < user_wifi_count)

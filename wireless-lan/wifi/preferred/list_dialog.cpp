@@ -1,16 +1,24 @@
 #include "preferred/list_dialog.h"
 
+#include <gdk/gdkkeysyms.h>
 #include <glib/gi18n.h>
 
+#include "base/accessible.h"
 #include "base/dialogs.h"
+#include "base/letters.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "preferred/add_dialog.h"
 #include "preferred/delete_dialog.h"
 #include "preferred/properties_dialog.h"
 #include "preferred/store.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
+
+constexpr char ADD_BUTTON[] = "preferred_button_add";
+constexpr char DELETE_BUTTON[] = "preferred_button_delete";
+constexpr char PROPERTIES_BUTTON[] = "preferred_button_properties";
 
 // Scrolls to a row; the list itself does not, as it stands in a viewport at its full height.
 static void reveal_row(GtkWidget *front, gint row)
@@ -35,11 +43,6 @@ static void reveal_selected()
 static void cb_reveal_selected(GtkWidget *, gint, gint, GdkEventButton *, gpointer)
 {
     reveal_selected();
-}
-
-static void cb_reveal_focus(GtkWidget *front, GtkScrollType, gfloat, gpointer)
-{
-    reveal_row(front, GTK_CLIST(front)->focus_row);
 }
 
 // "changed" of the range that is scrolled over: a row that was just added can be reached once the
@@ -76,13 +79,77 @@ void cb_user_list_down(GtkWidget *, gpointer)
     move_selected(1);
 }
 
+// Selects the row of the keyboard's focus, which the list only frames.
+static void cb_select_focus(GtkWidget *front, GtkScrollType, gfloat, gpointer)
+{
+    const gint row = GTK_CLIST(front)->focus_row;
+
+    if (row != my_wifi->user_cell_index && row >= 0 && row < user_wifi_count)
+        select_user_cell_row(row);
+    reveal_row(front, row);
+}
+
+static void click_widget(const char *key)
+{
+    GtkWidget *button = find_widget(key);
+
+    if (button != nullptr && gtk_widget_is_sensitive(button))
+        gtk_button_clicked(GTK_BUTTON(button));
+}
+
+// What the keys do in the list beside its own moves.
+static gboolean cb_list_key(GtkWidget *front, GdkEventKey *event, gpointer)
+{
+    const guint modifiers = event->state & gtk_accelerator_get_default_mod_mask();
+
+    if (modifiers == GDK_MOD1_MASK && (event->keyval == GDK_Up || event->keyval == GDK_KP_Up)) {
+        move_selected(-1);
+        return TRUE;
+    }
+    if (modifiers == GDK_MOD1_MASK && (event->keyval == GDK_Down || event->keyval == GDK_KP_Down)) {
+        move_selected(1);
+        return TRUE;
+    }
+    if (modifiers != 0)
+        return FALSE;
+
+    switch (event->keyval) {
+    case GDK_Home:
+    case GDK_KP_Home:
+        if (user_wifi_count > 0)
+            select_user_cell_row(0);
+        return TRUE;
+    case GDK_End:
+    case GDK_KP_End:
+        if (user_wifi_count > 0)
+            select_user_cell_row(user_wifi_count - 1);
+        return TRUE;
+    case GDK_Return:
+    case GDK_KP_Enter:
+        click_widget(PROPERTIES_BUTTON);
+        return TRUE;
+    case GDK_Delete:
+    case GDK_KP_Delete:
+        click_widget(DELETE_BUTTON);
+        return TRUE;
+    case GDK_Escape:
+        // The list would keep it for itself.
+        g_signal_emit_by_name(gtk_widget_get_toplevel(front), "close");
+        return TRUE;
+    default:
+        return FALSE;
+    }
+}
+
 static GtkWidget *create_front_window()
 {
     GtkWidget *window = gtk_scrolled_window_new(nullptr, nullptr);
     GtkWidget *front = build_user_cell_clist();
 
     g_signal_connect_after(front, "select-row", G_CALLBACK(cb_reveal_selected), nullptr);
-    g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_reveal_focus), nullptr);
+    g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_select_focus), nullptr);
+    g_signal_connect(front, "key-press-event", G_CALLBACK(cb_list_key), nullptr);
+    name_for_ears(front, _("Preferred Network"));
     gtk_container_set_border_width(GTK_CONTAINER(window), 5);
     gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(window), GTK_POLICY_AUTOMATIC,
                                    GTK_POLICY_AUTOMATIC);
@@ -127,10 +194,9 @@ static GtkWidget *create_edit_buttons(GtkWidget *dialog)
         const char *key;
         GCallback handler;
     } buttons[] = {
-        {GTK_STOCK_ADD, "preferred_button_add", G_CALLBACK(cb_configuration_add)},
-        {GTK_STOCK_DELETE, "preferred_button_delete", G_CALLBACK(cb_configuration_delete)},
-        {GTK_STOCK_PROPERTIES, "preferred_button_properties",
-         G_CALLBACK(cb_configuration_properties)},
+        {GTK_STOCK_ADD, ADD_BUTTON, G_CALLBACK(cb_configuration_add)},
+        {GTK_STOCK_DELETE, DELETE_BUTTON, G_CALLBACK(cb_configuration_delete)},
+        {GTK_STOCK_PROPERTIES, PROPERTIES_BUTTON, G_CALLBACK(cb_configuration_properties)},
     };
     GtkWidget *box = gtk_hbox_new(TRUE, 5);
 
@@ -179,9 +245,12 @@ static void take_front_list_out()
 
 void cb_preferred_network_setting(GtkWidget *, gpointer)
 {
+    set_letters_apart({GTK_STOCK_OK, GTK_STOCK_CANCEL, GTK_STOCK_GO_UP, GTK_STOCK_GO_DOWN,
+                       GTK_STOCK_ADD, GTK_STOCK_DELETE, GTK_STOCK_PROPERTIES});
+
     GtkWidget *dialog = begin_dialog(create_list_dialog());
 
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK) {
         debug_line("OK,we will connect network by this order.");
         save_user_cell_clist();

@@ -5,9 +5,11 @@
 
 #include <glib/gi18n.h>
 
+#include "base/accessible.h"
 #include "base/dialogs.h"
 #include "base/entries.h"
 #include "base/registry.h"
+#include "base/shown_key.h"
 #include "wifi.h"
 #include "wifi_info/debug.h"
 
@@ -99,11 +101,17 @@ static void attach_row(GtkWidget *table, guint row, const char *text, GtkWidget 
     gtk_table_attach(GTK_TABLE(table), control, 1, 2, row, row + 1, EXPAND_FILL, GTK_FILL, 5, 5);
 }
 
+static void cb_entered(GtkWidget *entry)
+{
+    gtk_dialog_response(GTK_DIALOG(gtk_widget_get_toplevel(entry)), GTK_RESPONSE_OK);
+}
+
 static GtkWidget *create_entry(const char *key)
 {
     GtkWidget *entry = create_text_entry();
 
     register_named_widget(entry, key);
+    g_signal_connect(entry, "activate", G_CALLBACK(cb_entered), nullptr);
     return entry;
 }
 
@@ -116,11 +124,13 @@ static GtkWidget *create_box(const char *key)
 }
 
 // Adds a radio button to `box`, in one group with `first` (NULL: a new group, chosen).
-static GtkWidget *add_radio(GtkWidget *box, GtkWidget *first, const char *text, const char *key)
+static GtkWidget *add_radio(GtkWidget *box, GtkWidget *first, const char *group, const char *text,
+                            const char *key)
 {
     GtkWidget *radio = gtk_radio_button_new_with_label_from_widget(GTK_RADIO_BUTTON(first), text);
 
     register_named_widget(radio, key);
+    name_in_group(radio, group, text);
     gtk_box_pack_start(GTK_BOX(box), radio, FALSE, FALSE, 0);
     return radio;
 }
@@ -128,28 +138,28 @@ static GtkWidget *add_radio(GtkWidget *box, GtkWidget *first, const char *text, 
 static GtkWidget *create_encryption_row(const network_form &form)
 {
     GtkWidget *box = gtk_hbox_new(FALSE, 5);
-    GtkWidget *wep = add_radio(box, nullptr, "WEP", form.wep);
+    GtkWidget *wep = add_radio(box, nullptr, _("Encryption"), "WEP", form.wep);
 
-    add_radio(box, wep, "WPA", form.wpa);
+    add_radio(box, wep, _("Encryption"), "WPA", form.wpa);
     return box;
 }
 
 static GtkWidget *create_mode_row(const network_form &form)
 {
     GtkWidget *box = create_box(form.mode_container);
-    GtkWidget *managed = add_radio(box, nullptr, _("Managed"), form.mode_managed);
+    GtkWidget *managed = add_radio(box, nullptr, _("Mode"), _("Managed"), form.mode_managed);
 
-    add_radio(box, managed, _("Ad-Hoc"), form.mode_adhoc);
+    add_radio(box, managed, _("Mode"), _("Ad-Hoc"), form.mode_adhoc);
     return box;
 }
 
 static GtkWidget *create_key_state_row(const network_form &form)
 {
     GtkWidget *box = create_box(form.wep_container);
-    GtkWidget *off = add_radio(box, nullptr, _("off"), form.enc[ENC_OFF]);
+    GtkWidget *off = add_radio(box, nullptr, _("Key state"), _("off"), form.enc[ENC_OFF]);
 
-    add_radio(box, off, _("open"), form.enc[ENC_OPEN]);
-    add_radio(box, off, _("restricted"), form.enc[ENC_RESTRICTED]);
+    add_radio(box, off, _("Key state"), _("open"), form.enc[ENC_OPEN]);
+    add_radio(box, off, _("Key state"), _("restricted"), form.enc[ENC_RESTRICTED]);
     return box;
 }
 
@@ -160,6 +170,7 @@ static GtkWidget *create_key_row(const network_form &form)
     GtkWidget *key_index = create_normal_ComboBox();
 
     gtk_entry_set_visibility(GTK_ENTRY(key), FALSE);
+    let_key_be_shown(key);
     register_named_widget(key_index, form.key_index);
     gtk_box_pack_start(GTK_BOX(box), key, TRUE, TRUE, 0);
     gtk_box_pack_start(GTK_BOX(box), create_label(_(" Key index:"), key_index), FALSE, FALSE, 0);

@@ -5,7 +5,9 @@
 
 #include "base/dialogs.h"
 #include "base/registry.h"
+#include "base/shown_key.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "preferred/network_form.h"
 #include "preferred/store.h"
 #include "wifi.h"
@@ -30,6 +32,7 @@ static void fill_form(gint row)
     choose_form_radio(form.enc[encmode]);
     set_widget_sensitive(form.key_hbox, encmode != ENC_OFF);
     set_form_text(form.key, user_cell_text(row, LIST_KEY));
+    keep_key_hidden(find_widget(form.key));
     printf("KEY_INDEX = %s \n", user_cell_text(row, LIST_KEY_INDEX));
     set_active_number(find_widget(form.key_index), user_cell_text(row, LIST_KEY_INDEX));
 }
@@ -92,7 +95,7 @@ void cb_configuration_properties(GtkWidget *, gpointer data)
     fill_form(row);
     connect_network_form(form);
     choose_key_mgmt(row);
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     // Looked up afresh: rows can go while the form stands.
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
            row < user_wifi_count && !store_network(row, dialog)) {

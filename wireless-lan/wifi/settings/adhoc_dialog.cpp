@@ -7,6 +7,7 @@
 
 #include "base/dialogs.h"
 #include "base/entries.h"
+#include "base/work_area.h"
 #include "wifi.h"
 #include "wifi_info/text.h"
 
@@ -146,6 +147,11 @@ static gboolean store_group(GtkWidget *dialog, const group_form *form, WIFI_CELL
     return TRUE;
 }
 
+static void cb_entered(GtkEntry *, gpointer dialog)
+{
+    gtk_dialog_response(GTK_DIALOG(dialog), GTK_RESPONSE_OK);
+}
+
 void cb_adhoc_setup(GtkWidget *, gpointer user_data)
 {
     WIFI_CELL *group_info = static_cast<WIFI_CELL *>(user_data);
@@ -154,7 +160,8 @@ void cb_adhoc_setup(GtkWidget *, gpointer user_data)
 
     create_unplaced(&form, group_info);
     pack_content(dialog, create_essid_row(&form, group_info));
-    gtk_widget_show_all(dialog);
+    g_signal_connect(form.essid, "activate", G_CALLBACK(cb_entered), dialog);
+    show_dialog(dialog);
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK &&
            !store_group(dialog, &form, group_info)) {
     }

@@ -7,6 +7,7 @@
 #include "base/dialogs.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "settings/adhoc_dialog.h"
 #include "settings/apply.h"
 #include "wifi.h"
@@ -189,7 +190,7 @@ static GtkWidget *create_settings_dialog(WIFI_INTERFACE *iface)
     gtk_window_set_default_size(GTK_WINDOW(dialog), 360, 320);
     gtk_container_set_border_width(GTK_CONTAINER(content), 5);
     pack_content(dialog, content);
-    gtk_widget_show_all(dialog);
+    show_dialog(dialog);
     return dialog;
 }
 

@@ -17,6 +17,15 @@ constexpr char CHECKING_KEY[] = "window-proc-win";
 constexpr char MARKER_FILE[] = "/etc/build_in_wifi";
 // The module takes up to six seconds until its interface appears.
 constexpr guint POWER_ON_MS = 6050;
+constexpr guint BORDER = 10; // of the checking window, pixels
+
+// The window has no decorations that would set it off from the one below.
+static gboolean cb_draw_border(GtkWidget *window, GdkEventExpose *event, gpointer)
+{
+    gtk_paint_shadow(gtk_widget_get_style(window), gtk_widget_get_window(window), GTK_STATE_NORMAL,
+                     GTK_SHADOW_OUT, &event->area, window, nullptr, 0, 0, -1, -1);
+    return FALSE;
+}
 
 // One-shot timer: looks for the interface again after the module was switched on.
 static gboolean cb_check_wifi(gpointer)
@@ -55,6 +64,8 @@ static void show_checking_window()
     gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
     gtk_container_add(GTK_CONTAINER(window), box);
     gtk_window_set_position(GTK_WINDOW(window), GTK_WIN_POS_CENTER);
+    gtk_container_set_border_width(GTK_CONTAINER(window), BORDER);
+    g_signal_connect(window, "expose-event", G_CALLBACK(cb_draw_border), nullptr);
     g_timeout_add(POWER_ON_MS, cb_check_wifi, nullptr);
     gtk_widget_show_all(window);
 }

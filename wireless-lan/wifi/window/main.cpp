@@ -8,10 +8,13 @@
 #include "base/desktop.h"
 #include "base/dialogs.h"
 #include "base/icons.h"
+#include "base/list_keyboard.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/device.h"
 #include "window/activation.h"
+#include "window/halves.h"
 #include "window/main_window.h"
 
 constexpr char TEXT_DOMAIN[] = "wireless-lan";
@@ -58,6 +61,7 @@ static gboolean start_jobs(gpointer)
             return FALSE;
         },
         nullptr);
+    use_program_icon();
     g_idle_add(notice_desktop, nullptr);
     return FALSE;
 }
@@ -103,6 +107,10 @@ int main(int argc, char **argv)
     gtk_paned_add2(GTK_PANED(pane), create_list());
     gtk_widget_show_all(pane);
     set_default_width(GTK_WINDOW(mainwindow));
+    keep_in_work_area(mainwindow);
+    share_room(mainwindow, pane);
+    keep_focus(mainwindow);
+    focus_list(my_wifi->wifi_view);
 
     gtk_widget_add_events(mainwindow, GDK_VISIBILITY_NOTIFY_MASK);
     g_signal_connect(mainwindow, "visibility-notify-event", G_CALLBACK(cb_first_sight), nullptr);

@@ -1,19 +1,26 @@
 #include "window/main_window.h"
 
+#include <gdk/gdkkeysyms.h>
 #include <glib/gi18n.h>
 
+#include "base/accessible.h"
+#include "base/list_keyboard.h"
 #include "base/network_list.h"
 #include "base/registry.h"
 #include "base/state.h"
+#include "base/work_area.h"
 #include "connection/flow.h"
 #include "preferred/list_dialog.h"
 #include "settings/wlan_dialog.h"
 #include "wifi.h"
 #include "window/activation.h"
+#include "window/columns.h"
+#include "window/halves.h"
 #include "window/refresh.h"
 #include "window/start_up.h"
 
-constexpr gint LIST_SIDE_WIDTH = 400; // pixels, the least
+constexpr gint LEFT_WIDTH = 240;      // pixels, the least
+constexpr gint LIST_SIDE_WIDTH = 400; // likewise
 // Borders and shadows around the list, and the scroll bar of a long one.
 constexpr gint LIST_SIDE_MARGIN = 60;
 
@@ -24,6 +31,17 @@ static GtkWidget *create_scrolled_window()
     gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(scrolled), GTK_POLICY_AUTOMATIC,
                                    GTK_POLICY_AUTOMATIC);
     return scrolled;
+}
+
+// F5 presses the button, where it can be pressed.
+static void add_refresh_key(GtkWidget *button)
+{
+    GtkAccelGroup *keys = gtk_accel_group_new();
+
+    gtk_window_add_accel_group(GTK_WINDOW(mainwindow), keys);
+    gtk_widget_add_accelerator(button, "clicked", keys, GDK_F5, static_cast<GdkModifierType>(0),
+                               static_cast<GtkAccelFlags>(0));
+    g_object_unref(keys);
 }
 
 static void add_button(GtkWidget *table, guint left, guint right, guint top, GtkWidget *button,
@@ -40,11 +58,12 @@ GtkWidget *create_left_text()
     GtkWidget *frame = gtk_frame_new(_("Settings"));
     GtkWidget *table = gtk_table_new(10, 2, TRUE);
 
-    gtk_widget_set_size_request(scrolled, 240, 300);
+    gtk_widget_set_size_request(scrolled, LEFT_WIDTH, 300);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), frame);
+    follow_focus(scrolled);
     gtk_frame_set_label_align(GTK_FRAME(frame), 0.0, 1.0);
     gtk_frame_set_shadow_type(GTK_FRAME(frame), GTK_SHADOW_ETCHED_OUT);
-    gtk_widget_set_size_request(frame, 220, 300);
+    gtk_widget_set_size_request(frame, SETTINGS_WIDTH, SETTINGS_HEIGHT);
     gtk_container_set_border_width(GTK_CONTAINER(frame), 10);
     gtk_container_set_border_width(GTK_CONTAINER(table), 10);
     gtk_container_add(GTK_CONTAINER(frame), table);
@@ -59,6 +78,7 @@ GtkWidget *create_left_text()
                G_CALLBACK(cb_preferred_network_setting));
     add_button(table, 0, 2, 7, gtk_button_new_with_label(_("Active WIFI")), ACTIVATE_BUTTON,
                G_CALLBACK(cb_active_device));
+    add_refresh_key(find_widget(REFRESH_BUTTON));
     gtk_widget_show_all(scrolled);
     return scrolled;
 }
@@ -74,6 +94,7 @@ static void arrange_tree_view(GtkWidget *view)
     for (gint column = 0; column < static_cast<gint>(G_N_ELEMENTS(titles)); column++)
         gtk_tree_view_insert_column_with_attributes(GTK_TREE_VIEW(view), -1, titles[column],
                                                     renderer, "text", column, nullptr);
+    fit_columns(view, renderer);
 }
 
 // A new empty model of five text columns. The caller owns it.
@@ -95,9 +116,11 @@ GtkWidget *create_list()
 
     gtk_container_set_border_width(GTK_CONTAINER(box), 10);
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(scrolled), box);
+    follow_focus(scrolled);
     gtk_widget_set_size_request(scrolled, LIST_SIDE_WIDTH, 500);
 
     register_named_widget(label, TITLE_LABEL);
+    announce_changes(label);
     gtk_misc_set_alignment(GTK_MISC(label), 0, 0);
     gtk_box_pack_start(GTK_BOX(box), label, FALSE, FALSE, 0);
 
@@ -106,6 +129,8 @@ GtkWidget *create_list()
     gtk_scrolled_window_add_with_viewport(GTK_SCROLLED_WINDOW(list_scrolled), view);
     arrange_tree_view(view);
     g_signal_connect(view, "button-press-event", G_CALLBACK(cb_view_sel), nullptr);
+    follow_list_keyboard(view);
+    name_for_ears(view, _("Wireless network selection"));
 
     g_object_set_data(G_OBJECT(mainwindow), NETWORK_ROWS, model);
     gtk_tree_view_set_model(GTK_TREE_VIEW(view), model);
@@ -140,7 +165,9 @@ void set_default_width(GtkWindow *window)
     g_object_unref(sample);
     gtk_widget_size_request(GTK_WIDGET(window), &whole);
     gtk_window_set_default_size(window,
-                                MIN(whole.width - LIST_SIDE_WIDTH + LIST_SIDE_MARGIN + list.width,
+                                MIN(whole.width - LEFT_WIDTH +
+                                        left_half_width(gtk_bin_get_child(GTK_BIN(window))) -
+                                        LIST_SIDE_WIDTH + LIST_SIDE_MARGIN + list.width,
                                     gdk_screen_get_width(gtk_window_get_screen(window))),
                                 -1);
 }
