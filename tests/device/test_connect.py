@@ -100,7 +100,7 @@ def test_a_connect_is_told_and_sent_after_a_moment(device):
     for name in LOCKED + ("button-active-device",):
         assert not app.sensitive(name)
     assert app.sensitive("view-press")
-    assert app.selected("view-press") == []
+    assert app.selected("view-press") == [1]
     assert [one.name for one in d.commands()] == ["cat", "cat"]
 
     # 100 ms later the device is told, its old address cleared first.

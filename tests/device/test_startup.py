@@ -240,8 +240,9 @@ def test_keyboard(device):
     d = device("street")
     app = d.start()
     app.wait_listed()
-    for name in ("button-refresh", "button-wifi-settings", "button-network-configure", "view-press",
-                 "button-connect", "button-refresh"):
+    assert app.find("view-press")["focus"]
+    for name in ("button-connect", "button-refresh", "button-wifi-settings",
+                 "button-network-configure", "view-press", "button-connect", "button-refresh"):
         app.key("Tab")
         wait_until(lambda: app.find(name)["focus"], f"the focus on {name}")
     app.key("space")

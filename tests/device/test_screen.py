@@ -1,0 +1,131 @@
+# SPDX-License-Identifier: MIT
+"""The screens that boards have: small, turned, with large type, in other languages."""
+
+import json
+import os
+
+import pytest
+
+import screens
+from harness import wait_until
+from harness.device import TOP
+from preferred import LIST
+from screens import DPI, LANGUAGES, SIZES, faults, steady, visit
+
+GEOMETRY = f"{TOP}/tests/device/geometry-1024x768.json"
+SETTINGS = "WLAN Setting"
+# Of every size, type and language one at least; `every-screen` takes them all.
+SOME = (((800, 480), 96, "en"), ((640, 480), 120, "de"), ((480, 272), 96, "en"),
+        ((480, 272), 160, "long"), ((320, 480), 96, "rtl"), ((1024, 768), 160, "long"),
+        ((800, 480), 160, "de"), ((1024, 768), 96, "zh"))
+ALL = tuple((size, dpi, language) for size in SIZES for dpi in DPI for language in LANGUAGES)
+
+
+def name_of(value):
+    return "x".join(map(str, value)) if isinstance(value, tuple) else str(value)
+
+
+def screen(device, size, language="en", **more):
+    return device("street", scan=screens.air(), size=name_of(size),
+                  files=screens.files(language), **more)
+
+
+@pytest.mark.parametrize("size, dpi, language",
+                         ALL if "EVERY_SCREEN" in os.environ else SOME, ids=name_of)
+def test_every_control_can_be_seen(device, size, dpi, language):
+    found = visit(screen(device, size, language), dpi, language)
+    assert not any(found.values()), "\n".join(f"{window}: {fault}" for window, all in found.items()
+                                              for fault in all)
+    assert len(found) == 11
+
+
+def test_a_large_screen_shows_what_it_always_did(device):
+    with open(GEOMETRY, encoding="utf-8") as file:
+        wanted = json.load(file)
+    app = screens.start(screen(device, (1024, 768)))
+    for name, pane in screens.tour(app):
+        shown = [[one["type"], one["name"] if one["name"] != one["type"] else "", *one["rect"]]
+                 for one in steady(pane).walk() if one["mapped"]]
+        assert shown == wanted.pop(name), name
+    assert not wanted
+
+
+def whole(pane, *names):
+    """Whether these widgets are in sight with all that they are, in all windows around them."""
+    for name in names:
+        widget = pane.find(name)
+        around = widget.parent
+        while around is not None:
+            if around["type"] == "GtkViewport" and \
+                    not screens.inside(widget["rect"], around["rect"]):
+                return False
+            around = around.parent
+    return True
+
+
+def test_what_is_in_sight_at_once(device):
+    d = screen(device, (1024, 768))
+    d.display.turn(800, 480)
+    app = screens.start(d)
+    window = steady(app)
+    assert not [bar for bar in window.walk() if bar["type"] in screens.SCROLL_BARS and
+                bar["mapped"] and not bar.parent.all("view-press")], "nothing has to be scrolled"
+    assert window["frame"] == [0, 0, 800, 480]
+    buttons = ("button-refresh", "button-wifi-settings", "button-network-configure",
+               "button-active-device")
+    assert whole(app, "title-label", "button-connect", *buttons)
+    app.kill()
+
+    d.display.turn(640, 480)
+    app = screens.start(d)
+    assert steady(app)["frame"] == [0, 0, 640, 480]
+    assert whole(app, "title-label", "button-connect")
+    app.kill()
+
+    d.display.turn(480, 272)
+    app = screens.start(d)
+    assert steady(app)["frame"] == [0, 0, 480, 272]
+    assert whole(app, "title-label", "button-connect")
+    app.press("button-refresh")
+    app.wait_listed()
+    for name, title in zip(buttons[1:], (SETTINGS, LIST)):  # scrolled to
+        app.press(name)
+        dialog = app.dialog(title)
+        app.key("Escape")
+        dialog.wait_gone()
+
+
+@pytest.mark.parametrize("manager", (True, False), ids=("managed", "alone"))
+def test_the_screen_turns_while_it_runs(device, manager):
+    d = screen(device, (1024, 768), window_manager=manager)
+    app = screens.start(d)
+    as_opened = steady(app)["rect"]
+
+    def fits(pane):
+        area = d.display.work_area()
+        wait_until(lambda: screens.inside(pane.tree()["frame"], area),
+                   lambda: f"{pane.tree()['frame']} to fit into {area}")
+        assert faults(steady(pane), area) == []
+
+    def turn(width, height):
+        d.display.turn(width, height)
+        wait_until(lambda: d.display.work_area()[2:] == [width, height], "the work area")
+
+    for width, height in ((480, 272), (320, 480), (800, 480)):
+        turn(width, height)
+        fits(app)
+        assert steady(app)["frame"] == [0, 0, width, height]
+    app.press("button-wifi-settings")
+    settings = app.dialog(SETTINGS)
+    turn(480, 272)
+    fits(settings)
+    turn(1024, 768)
+    wait_until(lambda: app.tree()["rect"][2:] == as_opened[2:], "the window's first size")
+    fits(settings)
+    settings.press("gtk-cancel")
+    settings.wait_gone()
+    if manager:
+        turn(480, 272)
+        d.display.panel(40)
+        fits(app)
+        assert steady(app)["frame"] == [0, 0, 480, 232]
