@@ -24,7 +24,7 @@ EXPECTED = os.path.join(HERE, "expected")
 COMMANDS = ("iwset", "lnk-ifup", "lnk-ifdown", "wireless-lan-auto", "iwlist", "cat", "ap-address",
             "udhcpc-script", "dhcpcd-script", "name-servers", "wpa-action")
 LIBRARIES = ("wireless-lan.sh", "address.sh", "automatic.sh", "managers.sh", "preferred.sh",
-             "settings.sh", "wpa-network.sh", "real-tool.sh", "dhclient-hook")
+             "settings.sh", "wpa-network.sh", "hosting.sh", "real-tool.sh", "dhclient-hook")
 STUBS = ("iwlist", "cat", "wpa_supplicant", "wpa_cli", "ip", "iw", "dhcpcd", "udhcpc", "dhclient",
          "nmcli", "connmanctl", "networkctl", "ifquery", "ifdown", "iwd", "hostapd",
          "systemd-network", "resolvectl", "resolvconf")

@@ -130,6 +130,27 @@ def start_everyone():
     return waiting
 
 
+@pytest.mark.parametrize("text, own", [
+    (None, b"10.42.0.1/24"), ("static", b"10.1.2.3/24")])
+def test_network_of_our_own(text, own):
+    """Whoever joins it gets an address, where dnsmasq is installed."""
+    sh("ip", "link", "add", "wlan0", "type", "veth", "peer", "name", "guest0")
+    sh("ip", "link", "set", "guest0", "up")
+    os.makedirs(machine.STATE)
+    write(f"{machine.STATE}/hosting", "")
+    if text:
+        static(gateway="0.0.0.0")
+    assert run("lnk-ifup", "wlan0") == (0, b"", b"")
+    assert b"inet " + own in addresses()
+    install_client("udhcpc")
+    got = subprocess.run(
+        ["udhcpc", "-i", "guest0", "-f", "-q", "-n", "-t", "10", "-T", "1", "-s", "/bin/true"],
+        stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
+    assert b"lease of " + own.rsplit(b".", 1)[0] + b"." in got.stdout, got.stdout
+    assert run("lnk-ifdown", "wlan0")[0] == 0
+    assert wait_for(lambda: not left("dnsmasq"))
+
+
 def test_no_server(server):
     """A client makes no address up, takes no old lease for a new one, and goes on asking."""
     for number, name in enumerate(CLIENTS):
