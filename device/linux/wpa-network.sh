@@ -31,14 +31,24 @@ start_supplicant() {
 }
 
 # learn_offer: asks our supplicant what it can do. No build knows every kind of key management, and
-# each refuses a whole file for one word that it does not know.
+# each refuses a whole file for one word that it does not know. Some that it knows it does not name.
 learn_offer() {
     answer=$(ask get_capability key_mgmt)
     offered=
-    for kind in WPA-PSK WPA-PSK-SHA256 FT-PSK SAE FT-SAE OWE; do
+    for kind in WPA-PSK FT-PSK SAE OWE; do
         case " $answer " in
         *" $kind "*) offered="$offered$kind " ;;
         esac
+    done
+    ! offers WPA-PSK || offered="${offered}WPA-PSK-SHA256 "
+    ! offers SAE || offered="${offered}H2E "
+    ! offers SAE || ! offers FT-PSK || offered="${offered}FT-SAE "
+}
+
+# without KIND: offered without it, and a blank after each that is left.
+without() {
+    for kind in $offered; do
+        [ "$kind" = "$1" ] || printf '%s ' "$kind"
     done
 }
 
@@ -52,12 +62,9 @@ read_offer() {
 # refuses them. What it refuses although it has offered it is left out.
 load_networks() {
     learn_offer
-    for less in '' H2E everything; do
-        case $less in
-        '') ! offers SAE || offered="$offered H2E" ;;
-        H2E) offered=${offered%H2E} ;;
-        everything) offered= ;;
-        esac
+    for less in none H2E FT-SAE WPA-PSK-SHA256 everything; do
+        offered=$(without "$less")
+        [ "$less" != everything ] || offered=
         printf '%s\n' "$offered" >"$state/offered"
         {
             common_lines

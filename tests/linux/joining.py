@@ -12,8 +12,9 @@ LISTED = "network id / ssid / bssid / flags\n0\tx\tany\t[CURRENT]\n"
 DISABLED = "network id / ssid / bssid / flags\n0\tx\tany\t[CURRENT][TEMP-DISABLED]\n"
 
 
-EVERYTHING = ("NONE IEEE8021X WPA-EAP WPA-PSK WPA-EAP-SHA256 WPA-PSK-SHA256 FT-PSK FT-EAP SAE "
-              "FT-SAE OWE DPP\n")
+# What Debian's wpa_supplicant answers with a card of today.
+EVERYTHING = ("NONE IEEE8021X WPA-EAP WPA-PSK WPA-EAP-SUITE-B WPA-EAP-SUITE-B-192 OWE DPP "
+              "FILS-SHA256 FILS-SHA384 FT-FILS-SHA256 FT-FILS-SHA384 FT-PSK FT-EAP SAE\n")
 
 
 def arguments(name, key="off", enc="off", mode="Managed", index="[1]", wpa=False):

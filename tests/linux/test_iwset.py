@@ -350,8 +350,8 @@ def test_management_frames_are_protected_where_the_driver_can():
 
 
 @pytest.mark.parametrize("offer, managements, common", [
-    ("WPA-PSK WPA-PSK-SHA256", b"WPA-PSK WPA-PSK-SHA256", {b"pmf": b"1"}),
-    ("WPA-PSK FT-PSK SAE", b"WPA-PSK FT-PSK SAE", {b"pmf": b"1", b"sae_pwe": b"2"}),
+    ("WPA-EAP WPA-PSK", b"WPA-PSK WPA-PSK-SHA256", {b"pmf": b"1"}),
+    ("WPA-PSK SAE", b"WPA-PSK WPA-PSK-SHA256 SAE", {b"pmf": b"1", b"sae_pwe": b"2"}),
     ("NONE WPA-EAP", b"WPA-PSK", {})])
 def test_only_what_the_supplicant_can_do_is_asked_of_it(offer, managements, common):
     note("capability-key_mgmt", offer + "\n")
@@ -362,7 +362,9 @@ def test_only_what_the_supplicant_can_do_is_asked_of_it(offer, managements, comm
 
 @pytest.mark.parametrize("words, managements, common", [
     ("sae_pwe", ALL_MANAGEMENTS, {b"pmf": b"1"}),             # older than hash to element
-    ("SAE\nsae_pwe\nFT-\n", b"WPA-PSK", {}), ("pmf", b"WPA-PSK", {})])
+    ("sae_pwe\nFT-SAE", b"WPA-PSK WPA-PSK-SHA256 FT-PSK SAE", {b"pmf": b"1"}),
+    ("sae_pwe\nFT-SAE\nSHA256", b"WPA-PSK FT-PSK SAE", {b"pmf": b"1"}),
+    ("SAE\nsae_pwe\nFT-", b"WPA-PSK", {}), ("pmf", b"WPA-PSK", {})])
 def test_what_it_refuses_all_the_same_is_left_out(words, managements, common):
     """One word that a build does not know makes it refuse the whole file."""
     note("refused-words", words)
