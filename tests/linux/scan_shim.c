@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 /* Preloaded into the real iwlist: answers its scan with the networks of the file $SCAN_NETWORKS, as
  * a driver built on cfg80211 would. Each line is a name in hexadecimal digits. */
 #define _GNU_SOURCE
