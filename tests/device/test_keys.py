@@ -135,3 +135,39 @@ def test_the_preferred_list(device):
     app.key("Escape")
     dialog.wait_gone()
     assert LIST not in [title for title, _ in app.dialogs()]
+
+
+def test_a_typed_key_can_be_shown(device):
+    stored = Network("stored", wpa=1, enc="open", key="secret")
+    _, app = start(device, stored)
+    dialog = open_list(app)
+    app.key("Up")
+    wait_until(lambda: dialog.selected(FRONT) == [0], "the row")
+    app.key("Return")
+    form = app.dialog(PROPERTIES)
+
+    def turn(shown):
+        app.key("shift+F10")
+        wait_until(lambda: [one for one in app.windows()
+                            if one["mapped"] and one.all("GtkMenu")], "the menu")
+        for key in ("Home", "Return"):
+            app.display.key(key)
+        wait_until(lambda: form.find("properties_key")["visibility"] == shown, f"shown: {shown}")
+
+    form.click("properties_key")
+    focused(form, "properties_key")
+    x, y, width, height = form.find("properties_key")["rect"]
+    app.display.click(x + width - 12, y + height // 2)
+    app.key("End")
+    form.type("properties_key", "x", replace=False)
+    wait_until(lambda: form.text("properties_key") == "secretx", "the letter")
+    assert not form.find("properties_key")["visibility"]  # some of it is the stored key
+
+    form.type("properties_key", "typed anew")
+    assert not form.find("properties_key")["visibility"]
+    app.display.click(x + width - 12, y + height // 2)
+    wait_until(lambda: form.find("properties_key")["visibility"], "the key to be seen")
+    turn(False)
+    turn(True)
+    app.key("Escape")
+    form.wait_gone()

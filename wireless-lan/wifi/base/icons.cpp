@@ -85,7 +85,7 @@ static void draw_pixel(int column, int row, guchar *pixel)
     pixel[3] = static_cast<guchar>(0xFF * covered / (SUB * SUB));
 }
 
-void use_program_icon()
+void use_program_icon(GtkWidget *window)
 {
     g_autoptr(GdkPixbuf) icon = gdk_pixbuf_new(GDK_COLORSPACE_RGB, TRUE, 8, ICON_SIZE, ICON_SIZE);
 
@@ -93,5 +93,7 @@ void use_program_icon()
         draw_pixel(i % ICON_SIZE, i / ICON_SIZE,
                    gdk_pixbuf_get_pixels(icon) + i / ICON_SIZE * gdk_pixbuf_get_rowstride(icon) +
                        4 * (i % ICON_SIZE));
+    // The default counts for windows that are shown from now on.
     gtk_window_set_default_icon(icon);
+    gtk_window_set_icon(GTK_WINDOW(window), icon);
 }

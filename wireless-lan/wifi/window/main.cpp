@@ -61,7 +61,9 @@ static gboolean start_jobs(gpointer)
             return FALSE;
         },
         nullptr);
-    use_program_icon();
+    // It may have been closed already.
+    if (mainwindow != nullptr)
+        use_program_icon(mainwindow);
     g_idle_add(notice_desktop, nullptr);
     return FALSE;
 }
