@@ -177,7 +177,7 @@ use_interface() {
     state=$run_dir/$1
     mkdir -p "$state" || exit 1
     chmod 700 "$run_dir" "$state"
-    need ip awk
+    need ip awk setsid
     take_turn
 }
 
