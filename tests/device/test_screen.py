@@ -17,7 +17,7 @@ SETTINGS = "WLAN Setting"
 # Of every size, type and language one at least; `every-screen` takes them all.
 SOME = (((800, 480), 96, "en"), ((640, 480), 120, "de"), ((480, 272), 96, "en"),
         ((480, 272), 160, "long"), ((320, 480), 96, "rtl"), ((1024, 768), 160, "long"),
-        ((800, 480), 160, "de"), ((1024, 768), 96, "zh"))
+        ((800, 480), 160, "de"), ((1024, 768), 96, "zh"), ((320, 480), 160, "long"))
 ALL = tuple((size, dpi, language) for size in SIZES for dpi in DPI for language in LANGUAGES)
 
 

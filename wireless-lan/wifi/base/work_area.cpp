@@ -255,6 +255,12 @@ static void fit_content(GtkWidget *dialog)
     const GtkRequisition largest = largest_size(dialog);
     GtkRequisition request;
 
+    // Buttons with long words stand one above the other.
+    gtk_widget_size_request(gtk_dialog_get_action_area(GTK_DIALOG(dialog)), &request);
+    if (request.width > largest.width)
+        gtk_orientable_set_orientation(
+            GTK_ORIENTABLE(gtk_dialog_get_action_area(GTK_DIALOG(dialog))),
+            GTK_ORIENTATION_VERTICAL);
     gtk_widget_size_request(dialog, &request);
 
     const kept_window *of = kept(dialog);
