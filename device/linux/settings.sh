@@ -1,6 +1,6 @@
 # shellcheck shell=sh
 # SPDX-License-Identifier: MIT
-# The settings of the interface in /etc/wireless.conf. "$interface" is that of wireless-lan.sh.
+# The settings of the interface in /etc/wireless.conf, and which interface they are for. "$interface" is that of wireless-lan.sh.
 # shellcheck disable=SC2034,SC2154
 
 # read_settings: the stanza of the interface. Without one an address comes by DHCP.
@@ -55,4 +55,17 @@ first_settings() {
         # Read-only, or somebody else was quicker.
         [ -e /etc/wireless.conf ] || say 'no first /etc/wireless.conf can be written'
     fi
+}
+
+# first_interface: the card that the window works with.
+first_interface() {
+    "${library%/*}/cat" /proc/net/wireless | while IFS=': ' read -r name _; do
+        case $name in
+        Inter-* | face) ;;
+        *)
+            printf '%s\n' "$name"
+            break
+            ;;
+        esac
+    done | grep .
 }

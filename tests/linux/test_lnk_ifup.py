@@ -107,6 +107,21 @@ def test_first_settings_are_written():
     assert read("/etc/wireless.conf") == b"mine"
 
 
+@pytest.mark.parametrize("words, name", [
+    ((), b"wlan0"), (("wlan7",), b"wlan7"), (("a/b",), None)])
+def test_first_settings_of_an_installation(words, name):
+    choose("ip", "iw", "udhcpc")
+    assert run("lnk-ifup", "--settings", *words)[0] == (0 if name else 2)
+    assert read("/etc/wireless.conf").split(b"\n")[0] == (b"iface " + name if name else b"")
+    assert calls("udhcpc") == [] and calls("ip") == []
+
+
+def test_no_card_no_first_settings():
+    machine.make_interfaces()
+    assert run("lnk-ifup", "--settings") == (0, b"", b"")
+    assert not os.path.exists("/etc/wireless.conf")
+
+
 def test_value_that_is_a_command_is_not_run():
     assert client_dns("iface wlan0\naddrtype $(touch /run/bad)\ndns `x`\n") == (0, [b"`x`"])
     assert not os.path.exists("/run/bad")

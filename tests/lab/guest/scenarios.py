@@ -62,6 +62,8 @@ def main():
         if only and name not in only:
             continue
         begun = time.monotonic()
+        # Anew for each: a look at what runs is no safe thing to do without need.
+        faulthandler.dump_traceback_later(400, repeat=True)
         try:
             scenario()
             verdict = f"ok {wanted}: {name.replace('_', ' ')}"
