@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The state model that the two units share: records, enumerations, limits and the shared globals.
 
 #ifndef WIRELESS_LAN_WIFI_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wifi_info/basic_settings.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The settings file, /etc/wireless.conf.
 
 #ifndef WIFI_INFO_BASIC_SETTINGS_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Diagnostics on standard error.
 
 #ifndef WIFI_INFO_DEBUG_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wifi_info/encryption.h"
 
 #include <initializer_list>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The words for an encryption.
 
 #ifndef WIFI_INFO_ENCRYPTION_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wifi_info/interfaces.h"
 
 #include <cstdio>

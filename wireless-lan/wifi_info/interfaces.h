@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The wireless interfaces that the kernel lists.
 
 #ifndef WIFI_INFO_INTERFACES_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wifi_info/preferred_file.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The file of the preferred networks, /etc/wireless-user.conf.
 
 #ifndef WIFI_INFO_PREFERRED_FILE_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Replacing a file as a whole.
 
 #ifndef WIFI_INFO_REPLACE_FILE_H

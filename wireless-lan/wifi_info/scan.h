@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Scanning for networks.
 
 #ifndef WIFI_INFO_SCAN_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Text for the shell, and running commands.
 
 #ifndef WIFI_INFO_SHELL_H

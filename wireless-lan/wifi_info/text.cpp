@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "wifi_info/text.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Texts, fields and lines.
 
 #ifndef WIFI_INFO_TEXT_H

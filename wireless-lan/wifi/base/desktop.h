@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // State notices to the desktop shell: text properties of the X11 root window.
 
 #ifndef WIFI_BASE_DESKTOP_H

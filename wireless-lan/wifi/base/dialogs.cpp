@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "base/dialogs.h"
 
 #include <initializer_list>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Message boxes, and what several dialogs build alike.
 
 #ifndef WIFI_BASE_DIALOGS_H

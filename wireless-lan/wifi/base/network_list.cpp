@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "base/network_list.h"
 
 #include <glib/gi18n.h>

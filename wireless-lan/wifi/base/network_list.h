@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The rows of the main window's network list.
 
 #ifndef WIFI_BASE_NETWORK_LIST_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "base/registry.h"
 
 #include <cstring>

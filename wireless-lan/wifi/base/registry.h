@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The named widgets of the main window.
 
 #ifndef WIFI_BASE_REGISTRY_H

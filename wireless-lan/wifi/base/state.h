@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The variables that the rooms of the window share; one GTK main thread reads and writes them.
 
 #ifndef WIFI_BASE_STATE_H

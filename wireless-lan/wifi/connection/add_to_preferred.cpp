@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/add_to_preferred.h"
 
 #include <cstring>

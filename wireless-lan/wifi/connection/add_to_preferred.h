@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The offer to keep a network with a new key among the preferred ones.
 
 #ifndef WIFI_CONNECTION_ADD_TO_PREFERRED_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/chosen_network.h"
 
 #include <cstring>

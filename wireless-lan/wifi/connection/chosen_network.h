@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The network that the user chose, found again after anything that may have run a refresh.
 
 #ifndef WIFI_CONNECTION_CHOSEN_NETWORK_H

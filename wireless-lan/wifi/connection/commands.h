@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the device is told: the command lines that join and leave a network and get an address.
 
 #ifndef WIFI_CONNECTION_COMMANDS_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/encrypted_dialog.h"
 
 #include <cstdio>

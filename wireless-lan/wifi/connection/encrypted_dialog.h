@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog that asks for key, key management and key index of an encrypted network.
 
 #ifndef WIFI_CONNECTION_ENCRYPTED_DIALOG_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/flow.h"
 
 #include <cstdio>

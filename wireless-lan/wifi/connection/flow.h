@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Selecting a network, connecting to it, disconnecting from it.
 
 #ifndef WIFI_CONNECTION_FLOW_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/interface_state.h"
 
 #include <cerrno>

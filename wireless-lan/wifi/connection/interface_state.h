@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What the kernel says of an interface, and what it is told: its address, its access point, its
 // link statistics.
 

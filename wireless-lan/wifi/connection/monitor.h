@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The pollers that follow a connect from association to an address, and the controls they give
 // back.
 

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "connection/question.h"
 
 #include <glib/gi18n.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // A question with room for a text.
 
 #ifndef WIFI_CONNECTION_QUESTION_H

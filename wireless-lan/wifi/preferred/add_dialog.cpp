@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "preferred/add_dialog.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog that adds a preferred network.
 
 #ifndef WIFI_PREFERRED_ADD_DIALOG_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "preferred/delete_dialog.h"
 
 #include <glib/gi18n.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog that deletes a preferred network.
 
 #ifndef WIFI_PREFERRED_DELETE_DIALOG_H

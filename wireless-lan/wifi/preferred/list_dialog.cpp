@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "preferred/list_dialog.h"
 
 #include <gdk/gdkkeysyms.h>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog with the preferred networks in their order of trial.
 
 #ifndef WIFI_PREFERRED_LIST_DIALOG_H

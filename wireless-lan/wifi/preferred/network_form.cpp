@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "preferred/network_form.h"
 
 #include <cstring>

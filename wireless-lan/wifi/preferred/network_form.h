@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The form that adding a preferred network and editing one share, and its toggle handlers.
 
 #ifndef WIFI_PREFERRED_NETWORK_FORM_H

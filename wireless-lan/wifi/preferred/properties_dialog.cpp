@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "preferred/properties_dialog.h"
 
 #include <cstdio>

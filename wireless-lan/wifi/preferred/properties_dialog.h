@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog that edits a preferred network.
 
 #ifndef WIFI_PREFERRED_PROPERTIES_DIALOG_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The preferred networks as rows of two column lists, which the dialogs edit, and their way back
 // into records and file. Row i of both lists and record i are the same network.
 

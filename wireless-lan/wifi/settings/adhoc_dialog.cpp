@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "settings/adhoc_dialog.h"
 
 #include <cstdio>

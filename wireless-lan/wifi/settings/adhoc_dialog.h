@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog with the network that the device hosts.
 
 #ifndef WIFI_SETTINGS_ADHOC_DIALOG_H

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "settings/apply.h"
 
 #include <arpa/inet.h>

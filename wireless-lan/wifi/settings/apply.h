@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Taking the settings over: validate, store, write, apply.
 
 #ifndef WIFI_SETTINGS_APPLY_H

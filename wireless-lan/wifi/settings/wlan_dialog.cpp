@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "settings/wlan_dialog.h"
 
 #include <initializer_list>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The dialog with the addressing of the interface and the switch of Ad-Hoc hosting.
 
 #ifndef WIFI_SETTINGS_WLAN_DIALOG_H

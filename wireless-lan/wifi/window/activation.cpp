@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "window/activation.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Switching a built-in wireless module on.
 
 #ifndef WIFI_WINDOW_ACTIVATION_H

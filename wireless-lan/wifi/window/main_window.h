@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // The two halves of the main window.
 
 #ifndef WIFI_WINDOW_MAIN_WINDOW_H

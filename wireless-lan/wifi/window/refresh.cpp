@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "window/refresh.h"
 
 #include <cstdio>

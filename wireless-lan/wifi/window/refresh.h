@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // Scanning, matching the access point, filling the list.
 
 #ifndef WIFI_WINDOW_REFRESH_H

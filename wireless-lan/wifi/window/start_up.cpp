@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 #include "window/start_up.h"
 
 #include "base/state.h"

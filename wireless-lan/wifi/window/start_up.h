@@ -1,3 +1,4 @@
+// SPDX-License-Identifier: MIT
 // What is loaded while the window is built.
 
 #ifndef WIFI_WINDOW_START_UP_H
