@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The state model that the two units share: records, enumerations, limits and the shared globals.
+// The state that both libraries share: records, enumerations, limits and the shared globals.
 
 #ifndef WIRELESS_LAN_WIFI_H
 #define WIRELESS_LAN_WIFI_H
@@ -131,12 +131,12 @@ static_assert(offsetof(MY_WIFI, wifi_view) == 24 + 208 * sizeof(void *));
 static_assert(offsetof(MY_WIFI, wifi_combo) == 24 + 209 * sizeof(void *));
 static_assert(offsetof(MY_WIFI, cell_type) == 24 + 210 * sizeof(void *));
 
-// Defined here, once for every program that includes the header, so that wifi_info links alone.
-inline MY_WIFI *my_wifi = nullptr;      // created by start-up, never freed
-inline gchar Link_AP_MAC[48] = {};      // written by get_ap_mac; empty or zeros: not associated
-inline gchar static_address[32] = {};   // written by the settings reader and by apply
-inline gchar static_netmask[32] = {};   // likewise
-inline gchar static_broadcast[32] = {}; // likewise
-inline gchar static_gateway[32] = {};   // likewise
+// Inline, so that wifi_info links without the window.
+inline MY_WIFI *my_wifi = nullptr;    // created by start-up, never freed
+inline gchar Link_AP_MAC[48] = {};    // written by get_ap_mac; empty or zeros: not associated
+inline gchar static_address[32] = {}; // written by the settings reader and by apply
+inline gchar static_netmask[32] = {}; // the same two write these
+inline gchar static_broadcast[32] = {};
+inline gchar static_gateway[32] = {};
 
 #endif

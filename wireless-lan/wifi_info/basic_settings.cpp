@@ -69,7 +69,8 @@ gboolean save_basic_setting_to_file(const gchar *file)
     return TRUE;
 }
 
-// Reads the next line and trims it. Behind the last line the former one stays, to be read again.
+// Reads the next line and trims it. At the end of the file `line` keeps the last one, which is then
+// read again.
 static gboolean next_line(FILE *stream, char *line)
 {
     if (fgets(line, LINE_SIZE, stream) == nullptr)
@@ -78,8 +79,8 @@ static gboolean next_line(FILE *stream, char *line)
     return TRUE;
 }
 
-// The piece of `line` behind the `index`th blank, trimmed: two blanks in a row hold an empty one.
-// FALSE, and `value` stays, when there are fewer blanks.
+// The field of `line` after the `index`th space, trimmed. Two spaces in a row enclose an empty
+// field. FALSE when there are fewer spaces; `value` is unchanged then.
 static gboolean get_piece(const char *line, int index, char *value)
 {
     for (; index > 0; index--) {
@@ -95,18 +96,19 @@ static gboolean get_piece(const char *line, int index, char *value)
     return TRUE;
 }
 
-// The value of a line that begins with `keyword`. FALSE: the line is another one or has no value.
+// The value of a line that begins with `keyword`. FALSE for any other line, and for one without a
+// value.
 static gboolean get_value(const char *line, const char *keyword, char *value)
 {
     return g_str_has_prefix(line, keyword) && get_piece(line, 1, value);
 }
 
-// Reads up to the line that names the first interface and leaves that in `line`. Without an
-// interface no line does.
+// Reads up to the line that names the first interface and leaves that line in `line`. FALSE when
+// there is no such line.
 static gboolean find_stanza(FILE *stream, char *line)
 {
     const WIFI_INTERFACE *iface = my_wifi->wifi_interface[0];
-    char name[LINE_SIZE] = ""; // a line without a name leaves the former one
+    char name[LINE_SIZE] = ""; // a line without a name leaves the previous one
 
     while (next_line(stream, line)) {
         if (!g_str_has_prefix(line, "iface"))
@@ -128,7 +130,7 @@ static void set_static(WIFI_INTERFACE *iface, gboolean isstatic)
     iface->isdhcp = !isstatic;
 }
 
-// Reads a fixed sequence of four lines; one that is not the expected one is passed over.
+// Reads exactly four lines. A line with another keyword than the expected one is skipped.
 static void read_addresses(FILE *stream, char *line)
 {
     char value[LINE_SIZE];
@@ -205,8 +207,8 @@ void read_basic_settings_advanced(FILE *stream)
     read_addresses(stream, line);
 }
 
-// Opens the settings for a reader. The stream stays open until the next reading, so one of them is
-// open however often they are read.
+// Opens the settings for a reader. Each call closes the previous stream, so that at most one is
+// open.
 static FILE *open_settings(const gchar *file)
 {
     static FILE *settings = nullptr;

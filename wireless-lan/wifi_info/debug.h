@@ -6,11 +6,10 @@
 
 #include <glib.h>
 
-// What every diagnostic of the program begins with.
+// The prefix of every diagnostic.
 constexpr char DEBUG_PREFIX[] = "WIRELESS-LAN-DEBUG: ";
 
-// Prints one line in a single write: the prefix, the formatted text (up to 4,000 bytes) and a line
-// end.
+// Prints the prefix, the formatted text (4,000 bytes at most) and a newline in a single write.
 void debug_line(const char *format, ...) G_GNUC_PRINTF(1, 2);
 
 #endif

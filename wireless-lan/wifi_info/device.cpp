@@ -17,9 +17,9 @@
 
 // The window waits for the answer, so it must come soon.
 static const gint64 ANSWER_LIMIT_US = 2 * G_USEC_PER_SEC;
-static const gsize ADDRESS_LENGTH = 17; // six pairs and five colons
+constexpr gsize ADDRESS_LENGTH = 17; // six pairs and five colons
 constexpr char REASON_FILE[] = "/run/wireless-lan/reason";
-static const gsize REASON_SIZE = 256; // of its one line, with the terminator
+constexpr gsize REASON_SIZE = 256; // of its one line, with the terminator
 
 static const char *device_path = "";
 

@@ -7,7 +7,7 @@
 
 #include "wifi.h"
 
-// By t_encmode and encryption_words.
+// Indexed by t_encmode and encryption_words.
 constexpr const char *WORDS[][3] = {
     {"off", "off", "ENC_OFF"},
     {"on", "open", "ENC_OPEN"},

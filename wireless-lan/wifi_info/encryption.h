@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The words for an encryption.
+// The words for an encryption in files, commands and lists.
 
 #ifndef WIFI_INFO_ENCRYPTION_H
 #define WIFI_INFO_ENCRYPTION_H
@@ -12,11 +12,11 @@ enum encryption_words {
     LIST_WORDS  // of the preferred lists: "ENC_OFF", "ENC_OPEN" and "ENC_RESTRICTED"
 };
 
-// The word for an encryption among FILE_WORDS or LIST_WORDS; a number that names none gives that of
+// The word for an encryption in FILE_WORDS or LIST_WORDS. An unknown number gives the word for
 // ENC_RESTRICTED.
 const char *encryption_word(t_encmode encmode, encryption_words words);
 
-// The encryption that `word` names, `otherwise` when it is none of the words.
+// The encryption that `word` stands for, or `otherwise` for an unknown word.
 t_encmode encryption_of(const char *word, encryption_words words, t_encmode otherwise);
 
 #endif

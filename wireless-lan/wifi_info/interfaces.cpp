@@ -7,7 +7,7 @@
 #include "wifi.h"
 #include "wifi_info/text.h"
 
-// Puts the name at the start of `line` into a slot; a record that is there keeps all the rest.
+// Stores the name at the start of `line` in a slot. An existing record keeps everything else.
 static void name_interface(int slot, const char *line)
 {
     WIFI_INTERFACE *&iface = my_wifi->wifi_interface[slot];
@@ -37,7 +37,8 @@ void read_interfaces(FILE *stream)
         if (count < MAX_INTERFACES)
             name_interface(count++, line);
     }
-    // The slot behind the last interface is filled too: the settings always find a first record.
+    // The slot after the last interface is filled too, because the settings need a first record
+    // even when there is no interface.
     if (count < MAX_INTERFACES)
         name_interface(count, line);
     my_wifi->interface_count = count;

@@ -8,13 +8,14 @@
 
 #include <glib.h>
 
-// Reads "cat /proc/net/wireless" (grammar: the kernel's net/wireless/wext-proc.c) into
-// interface_index, interface_count and wifi_interface of my_wifi. An existing record keeps all but
-// its name. Returns what closing the pipe returns, or FALSE when the command could not be started
-// (the table is untouched then). interface_count is -1 when the header line is missing.
+// Reads "cat /proc/net/wireless" (format: net/wireless/wext-proc.c of the kernel) into
+// interface_index, interface_count and wifi_interface of my_wifi. An existing record keeps
+// everything but its name. interface_count is -1 when the header line is missing. Returns the
+// result of closing the pipe, or FALSE, with nothing changed, when the command could not be
+// started.
 gboolean get_interface();
 
-// The same from an open stream, which stays open; a read error is its end.
+// The same from an open stream, which stays open. A read error ends it like the end of the file.
 void read_interfaces(FILE *stream);
 
 #endif

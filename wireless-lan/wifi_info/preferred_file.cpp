@@ -15,7 +15,8 @@ constexpr int LINE_SIZE = 255;
 
 gboolean save_preferred_network_to_file(const gchar *file)
 {
-    // Room for every field at its longest, so that the text is never moved.
+    // Enough for every field at its longest, so that the buffer is never reallocated and no copy of
+    // a key stays in the heap.
     const gsize records = static_cast<gsize>(my_wifi->user_cell_count);
     GString *text = g_string_sized_new(records * sizeof(WIFI_CELL) + 1);
 
@@ -28,8 +29,7 @@ gboolean save_preferred_network_to_file(const gchar *file)
         append_line(text, "MODE", cell->mode);
         append_number_line(text, "KMGMT", static_cast<int>(cell->key_mgmt));
         append_number_line(text, "KINDEX", static_cast<int>(cell->key_index));
-        // A number that names none is "off" here, while /etc/wireless.conf takes it for
-        // "restricted".
+        // An unknown number is written as "off" here, and as "restricted" to /etc/wireless.conf.
         append_line(
             text, "Encryption",
             encryption_word(cell->encmode <= ENC_RESTRICTED ? cell->encmode : ENC_OFF, FILE_WORDS));
@@ -45,12 +45,12 @@ gboolean save_preferred_network_to_file(const gchar *file)
     return saved;
 }
 
-// Copies what stands behind the first blank, inner blanks included.
+// Copies the text after the first space, with its inner spaces.
 static void copy_rest(char *field, gsize size, char *line)
 {
-    gchar *blank = strchr(line, ' ');
+    gchar *space = strchr(line, ' ');
 
-    copy_field(field, size, blank != nullptr ? g_strstrip(blank) : nullptr);
+    copy_field(field, size, space != nullptr ? g_strstrip(space) : nullptr);
 }
 
 static t_encmode read_encryption(const char *line)
@@ -69,7 +69,7 @@ static guint32 read_number(const char *line)
     return static_cast<guint32>(decimal(word));
 }
 
-// Reads the next line into `line`; after the last one it is empty.
+// Reads the next line into `line`, which is empty at the end of the file.
 static char *next_line(FILE *stream, char *line)
 {
     if (fgets(line, LINE_SIZE, stream) == nullptr)
@@ -77,7 +77,8 @@ static char *next_line(FILE *stream, char *line)
     return line;
 }
 
-// Reads the seven lines after a header by their position alone. What a cut file lacks stays zero.
+// Reads the seven lines after a header by position, whatever their keywords. Fields that are
+// missing at the end of a cut file stay zero.
 static void read_record(FILE *stream, WIFI_CELL *cell)
 {
     char line[LINE_SIZE];

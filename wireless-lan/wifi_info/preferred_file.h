@@ -10,17 +10,17 @@
 
 constexpr char USER_FILE[] = "/etc/wireless-user.conf";
 
-// Writes the user_cell_count preferred networks. FALSE when they could not be stored; the old file
-// stands then and standard error has the cause.
+// Writes the user_cell_count preferred networks. FALSE when they could not be stored: the old file
+// is unchanged, and the reason is on standard error.
 gboolean save_preferred_network_to_file(const gchar *file);
 
-// Rebuilds user_wifi_cell and user_cell_count from the file. A 65th network is read over and
-// dropped, which one line on standard error says. A file that cannot be opened changes nothing.
-// FALSE when the file holds more than is in memory now (it could not be opened or read to its end,
-// or networks were dropped); a file that does not exist is an empty one.
+// Rebuilds user_wifi_cell and user_cell_count from the file. The 65th and later networks are
+// dropped, with one line on standard error. A file that cannot be opened changes nothing. FALSE
+// when the file holds more than was read: it could not be opened or read to its end, or networks
+// were dropped. A missing file counts as an empty one.
 gboolean get_preferred_network_setting_from_file(const gchar *file);
 
-// The same from an open stream, which stays open; a read error is its end.
+// The same from an open stream, which stays open. A read error ends it like the end of the file.
 gboolean read_preferred_networks(FILE *stream);
 
 #endif

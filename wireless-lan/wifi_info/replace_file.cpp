@@ -9,10 +9,10 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-// The functions here that return an int return 0 or the errno of what failed.
+// Functions in this file that return an int return 0 or an errno.
 
-// What `path` names behind symbolic links, whether it exists or not; a link when they go in
-// circles.
+// The file that `path` names once symbolic links are followed, whether it exists or not. For links
+// in a cycle the result is a link.
 static gchar *resolve_links(const char *path)
 {
     gchar *name = g_strdup(path);
@@ -24,10 +24,10 @@ static gchar *resolve_links(const char *path)
             break;
 
         g_autofree gchar *link = name;
-        g_autofree gchar *folder = g_path_get_dirname(link);
+        g_autofree gchar *directory = g_path_get_dirname(link);
 
         name = g_path_is_absolute(target) ? g_strdup(target)
-                                          : g_build_filename(folder, target, nullptr);
+                                          : g_build_filename(directory, target, nullptr);
     }
     return name;
 }
@@ -47,11 +47,11 @@ static int write_all(int fd, const char *content, gsize length)
     return 0;
 }
 
-// The new name itself is on the disk only once the folder is.
-static void sync_folder(const char *target)
+// A rename survives a power cut only once the directory is synced.
+static void sync_directory(const char *target)
 {
-    g_autofree gchar *folder = g_path_get_dirname(target);
-    int fd = open(folder, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    g_autofree gchar *directory = g_path_get_dirname(target);
+    int fd = open(directory, O_RDONLY | O_DIRECTORY | O_CLOEXEC);
 
     if (fd < 0)
         return;
@@ -59,8 +59,8 @@ static void sync_folder(const char *target)
     close(fd);
 }
 
-// Fills a file beside the target. `old` is NULL when there is no mode and owner to keep. A change
-// of owner can clear bits of the mode, so it comes first.
+// Writes the temporary file beside the target. `old` is NULL when there are no mode and owner to
+// keep. The owner is set first because that can clear bits of the mode.
 static int fill(int fd, const struct stat *old, const char *content, gsize length)
 {
     if (old != nullptr && fchown(fd, old->st_uid, old->st_gid) != 0)
@@ -91,7 +91,7 @@ static int write_and_rename(const char *target, const struct stat *old, const ch
     if (reason == 0 && rename(name, target) != 0)
         reason = errno;
     if (reason == 0)
-        sync_folder(target);
+        sync_directory(target);
     else
         unlink(name);
     return reason;
@@ -109,8 +109,8 @@ static int overwrite(int fd, const char *content, gsize length)
     return reason;
 }
 
-// The room is reserved before a byte of the old content goes, and the old content is put back when
-// the new one cannot be written: only a power cut can leave half a file here.
+// Reserves the space before it touches the old content, and restores the old content when the new
+// one cannot be written: only a power cut can leave half a file here.
 static int write_in_place(const char *target, const char *content, gsize length,
                           replace_error *step)
 {
@@ -136,15 +136,15 @@ static int write_in_place(const char *target, const char *content, gsize length,
     return reason;
 }
 
-// Whether a file can still be written in place when renaming over it failed for this reason: a
-// folder that is read-only or not ours, a file that is a mount point, an owner that cannot be kept.
+// Whether writing in place can help when renaming failed with `reason`: a directory that is
+// read-only or not ours, a target that is a mount point, an owner that cannot be kept.
 static gboolean may_write_in_place(int reason)
 {
     return reason == EACCES || reason == EPERM || reason == EROFS || reason == EBUSY ||
            reason == EXDEV;
 }
 
-// Nothing is put in the place of a folder, a device or links in a circle.
+// Refuses to replace a directory, a device, or links in a cycle.
 static int check_type(mode_t mode)
 {
     if (S_ISREG(mode))
@@ -176,7 +176,7 @@ gboolean replace_file(const char *path, const char *content, gsize length, GErro
     return report(path, step, reason, error);
 }
 
-// Puts a hard link to `target` in the place of `name`, whatever stands there.
+// Makes `name` a hard link to `target` and replaces what was there.
 static int link_over(const char *target, const char *name)
 {
     g_autofree gchar *link_name = g_strconcat(name, ".new", nullptr);
@@ -187,7 +187,7 @@ static int link_over(const char *target, const char *name)
 
     const int reason = rename(link_name, name) != 0 ? errno : 0;
 
-    // A rename over another link to the same file leaves both.
+    // Renaming one hard link over another of the same file leaves both.
     unlink(link_name);
     return reason;
 }

@@ -16,7 +16,7 @@
 
 constexpr int LINE_SIZE = 512;
 
-// What stands behind `target`, up to the first separator, or the second one when `unit` is set.
+// The text after `target`, up to the first separator, or up to the second one when `unit` is set.
 static gchar *first_pieces(gchar *src, const gchar *target, const char *separator, int unit)
 {
     gchar *keyword = strstr(src, target);
@@ -59,11 +59,12 @@ gchar *get_essid_value(gchar *src, const gchar *target, int unit)
     return first_pieces(src, target, "        ", unit);
 }
 
-// What iwlist says about a network. The order is the one in which the keywords of a line are tried.
+// The values of a network in the output of iwlist, in the order in which a line is searched for
+// their keywords.
 static const struct {
     const char *keyword;
     gchar *(*extract)(gchar *src, const gchar *target, int unit);
-    const char *label; // on standard error; the encryption key has a line of its own
+    const char *label; // for standard error; NULL for the encryption key, which prints its own line
     gsize offset, size;
 } VALUES[] = {
     {"Address:", get_string_value, "Address", offsetof(WIFI_CELL, address),
@@ -78,7 +79,7 @@ static const struct {
      sizeof(WIFI_CELL::key)},
 };
 
-// The name without its quotes; blanks just inside them go too.
+// Removes the quotes around a name, and the spaces just inside them.
 static gchar *unquote(gchar *name)
 {
     gsize length = strlen(name);
@@ -90,7 +91,7 @@ static gchar *unquote(gchar *name)
     return g_strstrip(name);
 }
 
-// Takes the first value of the line that the network still lacks. FALSE: the line has none.
+// Stores the first value in the line that the network still lacks. FALSE when there is none.
 static gboolean take_value(char *line, gboolean *keywords_used, WIFI_CELL *cell)
 {
     for (gsize i = 0; i < G_N_ELEMENTS(VALUES); i++) {
@@ -132,8 +133,8 @@ static gboolean take_authentication(char *line, WIFI_CELL *cell)
     return TRUE;
 }
 
-// Reads from the network's first line to its "Bit Rates:" line. A network without one goes on into
-// the lines of the next, which fill what is still missing.
+// Reads from the first line of a network to its "Bit Rates:" line. Where that is missing, the lines
+// of the next network fill in what this one lacks.
 static void read_cell(FILE *stream, char *line, WIFI_CELL *cell)
 {
     gboolean keywords_used[G_N_ELEMENTS(VALUES)] = {};

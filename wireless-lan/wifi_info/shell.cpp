@@ -24,7 +24,7 @@ gchar *echo_command(const char *text, const char *path)
 {
     WIPED gchar *escaped = shell_escape(text);
 
-    // An echo may take "-n" for an option, and that of dash turns "\t" into a tabulator.
+    // Some shells' echo takes "-n" as an option, and that of dash expands "\t" to a tab.
     if (text[0] == '-' || strchr(text, '\\') != nullptr)
         return g_strdup_printf("printf '%%s\\n' \"%s\" >%s", escaped, path);
     return g_strdup_printf("echo \"%s\" >%s", escaped, path);

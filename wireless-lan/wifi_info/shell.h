@@ -6,25 +6,24 @@
 
 #include <glib.h>
 
-// A new copy of `text` that the shell reads between double quotes as exactly `text`: a backslash
-// stands before each ", \, $ and `. g_free it.
+// A new copy of `text` with a backslash before each ", \, $ and `, so that a shell reads it between
+// double quotes as exactly `text`. g_free it.
 gchar *shell_escape(const char *text);
 
-// A new command line that writes `text` and a line end to `path` (a name that is plain to a shell).
-// It is `echo "%s" >path`; a text that some echo would read as something else goes through printf.
-// g_free it.
+// A new command line that writes `text` and a newline to `path`, whose name must be plain to a
+// shell: `echo "%s" >path`, or printf for a text that some echo would change. g_free it.
 gchar *echo_command(const char *text, const char *path);
 
-// Runs a command line through the shell and waits for it; how it ends is not looked at: the outcome
-// of a command is learnt from the interface.
+// Runs a command line through the shell and waits for it. The exit status is ignored: the state of
+// the interface shows the outcome.
 void run_command(const char *command);
 
-// TRUE for a name that the kernel could give to an interface (1 to 15 bytes, no blank, no '/', no
-// ':', see dev_valid_name in net/core/dev.c) and that means nothing to a shell, nor an option to a
-// command. For any other name one line goes to standard error, saying that `step` is skipped.
+// TRUE for a name that the kernel could give to an interface (1 to 15 bytes, no white space, no
+// '/', no ':', see dev_valid_name in net/core/dev.c) and that no shell or command takes for
+// anything but a name. Otherwise FALSE, and one line on standard error says that `step` is skipped.
 gboolean interface_usable(const char *name, const char *step);
 
-// Runs "/sbin/ifconfig %s up" for a usable name.
+// Runs "/sbin/ifconfig %s up" if the name is usable.
 void bring_interface_up(const char *name);
 
 #endif

@@ -10,7 +10,7 @@
 
 constexpr char WHITE_SPACE[] = " \t\n\v\f\r";
 
-// How many of the first `length` bytes are whole characters; `text` is longer than that.
+// How many of the first `length` bytes are whole UTF-8 characters; `text` is longer than `length`.
 static gsize whole_characters(const char *text, gsize length)
 {
     gsize start = length;
@@ -82,7 +82,8 @@ gchar *one_line(const char *text)
     return g_strdelimit(g_strdup(text), "\r\n", ' ');
 }
 
-// How many bytes of `text` make a control character: 1 of ASCII, 2 of U+0080 to U+009F, else 0.
+// The length of the control character that `text` begins with: 1 in ASCII, 2 for U+0080 to U+009F,
+// 0 when there is none.
 static int control_length(const guchar *text)
 {
     if (text[0] < 0x20 || text[0] == 0x7F)
@@ -123,7 +124,7 @@ void append_line(GString *content, const char *keyword, const char *value)
 {
     WIPED gchar *line = one_line(value);
 
-    // Pieces, since a formatted line would leave a copy of a key behind.
+    // In pieces, because formatting the line would leave a copy of the key in the heap.
     for (const char *piece : {keyword, " ", static_cast<const char *>(line), "\n"})
         g_string_append(content, piece);
 }
