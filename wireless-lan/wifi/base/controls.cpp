@@ -5,7 +5,7 @@
 
 static const struct {
     const char *key;
-    guint holds; // any of them keeps it grey
+    guint holds; // each of them keeps the control grey
 } CONTROLS[] = {
     {PREFERRED_BUTTON, HOLD_CHECK | HOLD_REFRESH | HOLD_CONNECT},
     {CONNECT_BUTTON, HOLD_CHECK | HOLD_REFRESH | HOLD_CONNECT | HOLD_HOST},
@@ -14,7 +14,7 @@ static const struct {
     {NETWORK_VIEW, HOLD_REFRESH | HOLD_HOST},
 };
 
-static guint current = 0; // the holds that last
+static guint current = 0; // the holds in force
 
 static void apply_holds()
 {

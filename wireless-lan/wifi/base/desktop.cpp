@@ -10,8 +10,8 @@
 
 #include "wifi_info/debug.h"
 
-// Replaces the root-window property `atom_str` (type STRING, format 8) by `data` as decimal text.
-// It leaves at once, since a command that blocks the main loop may follow. NULL: nothing is done.
+// Sets the root-window property `atom_str` (type STRING, format 8) to `data` as decimal text, and
+// flushes it, because a command that blocks the main loop may follow. NULL is ignored.
 static void send_atom_to_desktop(const gchar *atom_str, int data)
 {
     if (atom_str == nullptr)

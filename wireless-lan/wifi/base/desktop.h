@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// State notices to the desktop shell: text properties of the X11 root window.
+// Notices to the desktop shell, as text properties of the X11 root window.
 
 #ifndef WIFI_BASE_DESKTOP_H
 #define WIFI_BASE_DESKTOP_H
@@ -14,10 +14,10 @@ enum desktop_status : int {
     STATUS_SCANNING = 5
 };
 
-// Sends "_NET_WIFI_CHANGE_STATUS".
+// Sets "_NET_WIFI_CHANGE_STATUS".
 void send_status_to_desktop(desktop_status status);
 
-// Idle job: tells the desktop the program's process id in "_NET_WIFI_STOP_CHECK". FALSE: run once.
+// Idle callback: publishes the process id in "_NET_WIFI_STOP_CHECK". Always FALSE.
 gboolean notice_desktop(gpointer data);
 
 #endif

@@ -87,7 +87,7 @@ GtkWidget *create_dialog(const gchar *title, GtkWidget *parent, dialog_default w
                                     GTK_STOCK_OK, GTK_RESPONSE_OK, nullptr);
     GtkWidget *cancel =
         gtk_dialog_add_button(GTK_DIALOG(dialog), GTK_STOCK_CANCEL, GTK_RESPONSE_REJECT);
-    // Without a default button the window takes the default itself.
+    // The window itself takes the default when no button has it.
     GtkWidget *widget = which == DEFAULT_CANCEL ? cancel : dialog;
 
     gtk_window_set_type_hint(GTK_WINDOW(dialog), GDK_WINDOW_TYPE_HINT_DIALOG);

@@ -9,7 +9,7 @@
 static_assert(sizeof(WIFI_CELL::alias) == TEXT_SIZE && sizeof(WIFI_CELL::essid) == TEXT_SIZE &&
               sizeof(WIFI_CELL::userkey) == TEXT_SIZE);
 
-// "insert-text": inserts the part that fits in its place.
+// "insert-text": inserts only the part that fits.
 static void cb_limit(GtkEditable *editable, const gchar *text, gint length, gint *position,
                      gpointer)
 {

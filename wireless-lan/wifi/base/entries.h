@@ -6,19 +6,18 @@
 
 #include <gtk/gtk.h>
 
-// The bytes that a name, an alias or a key has in every record, with its terminator.
+// The size of a name, an alias or a key in every record, with its terminator.
 constexpr gsize TEXT_SIZE = 128;
 
-// Lets an entry take no more bytes than such a field holds, typed or pasted, and never a part of a
-// character: what does not fit is left out with a beep. Handlers of "insert-text" that were
-// connected before see the whole text.
+// Limits an entry, typed or pasted, to what such a field holds: the rest is dropped with a beep,
+// and no character is split. "insert-text" handlers connected earlier see the whole text.
 void limit_text_entry(GtkWidget *entry);
 
-// A new entry with that limit.
+// A new entry with this limit.
 GtkWidget *create_text_entry();
 
-// Shows `text` in such an entry as `displayable` makes it, whole, though that may be longer than
-// the field.
+// Shows all of `text`, made valid by displayable(), in such an entry, although the result may be
+// longer than the field.
 void fill_text_entry(GtkWidget *entry, const char *text);
 
 #endif

@@ -8,7 +8,7 @@
 static gchar **search_path = nullptr; // of the theme before it was emptied
 static gint search_path_length = 0;
 
-// The toolkit's default names a theme that every system falls back to, not one that somebody chose.
+// GTK+'s default value names a theme that every system falls back to, not one that somebody chose.
 static gboolean theme_chosen(GtkSettings *settings)
 {
     GParamSpec *property =

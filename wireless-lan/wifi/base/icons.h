@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Where the toolkit looks its icons up.
+// Where GTK+ looks up icons.
 
 #ifndef WIFI_BASE_ICONS_H
 #define WIFI_BASE_ICONS_H

@@ -6,11 +6,12 @@
 
 #include <gtk/gtk.h>
 
-// Appends one row; the five texts are shown as they are, made valid UTF-8.
+// Appends one row. Each text is shown as it is, made valid UTF-8.
 void model_data_new(GtkListStore *store, const gchar *ESSID, const gchar *Mode, const gchar *Key,
                     const gchar *Quality, const gchar *State);
 
-// The state of the connected network while the interface has `address`. g_free it.
+// The text of the "State" column for the network that the interface is connected to with `address`.
+// g_free it.
 gchar *connected_state(const char *address);
 
 // Removes all rows.

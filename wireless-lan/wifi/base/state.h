@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The variables that the rooms of the window share; one GTK main thread reads and writes them.
+// The variables that the modules of the window share. Only the GTK+ main thread uses them.
 
 #ifndef WIFI_BASE_STATE_H
 #define WIFI_BASE_STATE_H
@@ -18,14 +18,14 @@ extern gint user_wifi_count;         // rows of the preferred lists; written by 
 extern GtkWidget *global_build_list; // the front list of start-up; written by start_up, store
 extern gint boxspacing;              // padding of the settings' address rows, pixels
 
-// Creates the zeroed state record with nothing selected. FALSE when memory is refused.
+// Creates the state record: zeroed, nothing selected. FALSE when there is no memory.
 gboolean my_wifi_init();
 
 // The first interface record, NULL when there is none yet.
 WIFI_INTERFACE *first_interface();
 
-// The scanned network at `index`, NULL for an index beyond the list. Look it up afresh after
-// anything that ran a main loop.
+// The scanned network at `index`, NULL when there is none. Look it up again after anything that ran
+// a main loop.
 WIFI_CELL *scanned_cell(int index);
 
 #endif

@@ -44,7 +44,7 @@ void Add2Preferred(GtkWidget *parent)
 
     gtk_widget_hide_all(parent);
 
-    // The second of two quick presses on Enter in the key entry must not keep a key unseen.
+    // Enter pressed twice in the key entry must not store the key unseen.
     g_autofree gchar *alias =
         ask_text(parent, _("Do you want to add this configuration to the preferred network?"),
                  _("Alias:"), ENTER_ANSWERS_WITH_TEXT);

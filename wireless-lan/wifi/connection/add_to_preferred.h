@@ -1,13 +1,13 @@
 // SPDX-License-Identifier: MIT
-// The offer to keep a network with a new key among the preferred ones.
+// Offering to keep a network with a new key as a preferred one.
 
 #ifndef WIFI_CONNECTION_ADD_TO_PREFERRED_H
 #define WIFI_CONNECTION_ADD_TO_PREFERRED_H
 
 #include <gtk/gtk.h>
 
-// Asks whether the network at connect_index is to be kept, hiding `parent`; on Yes it becomes the
-// last preferred network and the file is written.
+// Hides `parent` and asks whether to keep the network at connect_index. On Yes the network is
+// appended to the preferred ones and the file is written.
 void Add2Preferred(GtkWidget *parent);
 
 #endif

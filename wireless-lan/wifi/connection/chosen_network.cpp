@@ -12,8 +12,8 @@ static gboolean is_network(const WIFI_CELL *cell, const char *address, const cha
     return strcmp(cell->address, address) == 0 && strcmp(cell->essid, essid) == 0;
 }
 
-// The index of the network that is listed under this address and name, -1 for none. One access
-// point can be in the list twice, so the index in hand goes first.
+// The index of the network with this address and name, -1 for none. One access point can be listed
+// twice, so the current index is tried first.
 static int find_network(const char *address, const char *essid)
 {
     const WIFI_CELL *cell = scanned_cell(connect_index);
@@ -30,7 +30,7 @@ WIFI_CELL *find_chosen_network(const WIFI_CELL *chosen)
 {
     int index = find_network(chosen->address, chosen->essid);
 
-    // A scan lists a hidden network without the name that the user typed.
+    // A scan reports a hidden network without the name that the user typed.
     if (index < 0)
         index = find_network(chosen->address, "");
     if (index < 0)

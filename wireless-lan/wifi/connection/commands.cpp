@@ -40,7 +40,7 @@ gchar *iwset_command(const char *name, const WIFI_CELL *cell)
         return g_strdup_printf("/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\""
                                " \"[%d]\"",
                                name, essid, mode, key, enc, static_cast<int>(cell->key_index + 1));
-    // The two blanks are part of the format.
+    // The two spaces are part of the format.
     return g_strdup_printf("/sbin/iwset  wpa \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"",
                            name, essid, mode, key, enc);
 }
@@ -146,7 +146,7 @@ gboolean host_network(const WIFI_INTERFACE *iface)
 
     g_autofree gchar *up = g_strdup_printf("ifconfig %s up", iface->name);
     g_autofree gchar *essid = shell_escape(group->essid);
-    // The device hosts without a key; the group's key is only stored.
+    // The device hosts an open network; the key is stored but not used.
     g_autofree gchar *iwset = g_strdup_printf(
         "/sbin/iwset \"%s\" essid \"%s\" mode \"%s\" key \"%s\" enc \"%s\"", iface->name, essid,
         "Ad-Hoc", "off", encryption_word(group->encmode, FILE_WORDS));
@@ -175,10 +175,10 @@ gboolean require_ip_address()
     const pid_t child = fork();
 
     if (child == 0) {
-        // The script goes to init when its parent, this child, leaves: no zombie stays behind it.
+        // The child exits at once, so init adopts the script and reaps it.
         if (fork() == 0)
             execl("/sbin/lnk-ifup", "lnk-ifup", iface->name, nullptr);
-        // Not exit(): the text that waits in stdio's buffers is the parent's to print.
+        // Not exit(), which would print the parent's buffered output a second time.
         _exit(0);
     }
     if (child < 0)

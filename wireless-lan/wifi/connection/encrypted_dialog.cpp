@@ -21,18 +21,18 @@
 
 constexpr guint PADDING = 5;
 
-// Registry keys of the dialog's controls while it is open.
+// Registry keys of the dialog's controls.
 constexpr char AUTHENTICATION_KEY[] = "Authentication_ComboBox";
 constexpr char KEY_INDEX_KEY[] = "Key_Index_ComboBox";
 constexpr char ENTRY_KEY[] = "connect_key";
 
-// The key of the preferred network that was filled in, NULL: none.
+// The stored key that the dialog was filled with, NULL: none.
 static gchar *sel_key = nullptr;
-// The key management and key index that were filled in with it.
+// The key management and key index that came with it.
 static int key_mgmt = 0;
 static int key_index = 0;
 
-// The network that the dialog was built for, by name: connect_index may move while it is open.
+// The name of the network that the dialog was built for; connect_index may change while it is open.
 static char sought_essid[sizeof(WIFI_CELL::essid)] = "";
 
 static GtkWidget *backend_list()
@@ -50,8 +50,9 @@ static GtkWidget *invalid_widget()
     return static_cast<GtkWidget *>(GINT_TO_POINTER(1));
 }
 
-// The first preferred network of the sought name from `row` on, -1 when there is none. Row and
-// record are the same network; where rows were edited and not saved only what both have counts.
+// The first preferred network with the sought name from `row` on, -1 when there is none. Row and
+// record are the same network only as far as both exist: rows can have been edited without being
+// saved.
 static int next_match(GtkWidget *backend, int row)
 {
     const int records = MIN(MIN(user_wifi_count, my_wifi->user_cell_count), MAX_USER_CELLS);
@@ -71,7 +72,7 @@ static gboolean wep_active(GtkWidget *authentication)
     return gtk_combo_box_get_active(GTK_COMBO_BOX(authentication)) == 0;
 }
 
-// "changed" of the authentication combo: only WEP keys have an index.
+// "changed" of the authentication combo: only a WEP key has an index.
 static void cb_key_index_stat(GtkWidget *, gpointer)
 {
     GtkWidget *authentication = find_widget(AUTHENTICATION_KEY);
@@ -80,7 +81,7 @@ static void cb_key_index_stat(GtkWidget *, gpointer)
         set_widget_sensitive(KEY_INDEX_KEY, wep_active(authentication));
 }
 
-// Copies the active item of the combo under `key` into a record and a global.
+// Stores the active item of the combo under `key` in a record and in a variable.
 static void take_active(const char *key, guint32 *field, int *global)
 {
     GtkWidget *combo = find_widget(key);
@@ -91,8 +92,8 @@ static void take_active(const char *key, guint32 *field, int *global)
     *field = static_cast<guint32>(*global);
 }
 
-// "changed" of the preferred combo: fills the chosen network's key in, hidden, and takes the shown
-// key management and key index over into its record, key_mgmt and key_index.
+// "changed" of the preferred combo: fills in the stored key of the chosen network, hidden, and
+// stores the shown key management and key index in its record, key_mgmt and key_index.
 static void cb_change_network(GtkWidget *combobox, gpointer)
 {
     GtkWidget *backend = backend_list();
@@ -112,15 +113,15 @@ static void cb_change_network(GtkWidget *combobox, gpointer)
     GtkWidget *entry = find_widget(ENTRY_KEY);
 
     if (entry != nullptr) {
-        // Visible while it is filled: that is no touch of a hidden key.
+        // Visible while it is filled, so that filling it does not count as touching a hidden key.
         gtk_entry_set_visibility(GTK_ENTRY(entry), TRUE);
         fill_text_entry(entry, record->userkey);
         gtk_entry_set_visibility(GTK_ENTRY(entry), FALSE);
         wipe_text(&sel_key);
         sel_key = g_strdup(record->userkey);
     }
-    // The record takes over what is shown, not the other way round: the combos show the last
-    // network of the name, and a changed answer is recognised against these two.
+    // From the combos to the record, not the other way round: the combos show the last network of
+    // the name, and is_new_configuration compares against these two.
     take_active(AUTHENTICATION_KEY, &record->key_mgmt, &key_mgmt);
     take_active(KEY_INDEX_KEY, &record->key_index, &key_index);
 }
@@ -200,8 +201,8 @@ static void remove_hidden_key(GtkEditable *editable)
     gtk_editable_delete_text(editable, 0, -1);
 }
 
-// "insert-text" and "delete-text" of the key entry: a hidden key that is touched in any way goes as
-// a whole, so that no text is ever a mixture of it and what was typed.
+// "insert-text" and "delete-text" of the key entry: any edit of a hidden key first removes all of
+// it, so that a stored key and typed text never mix.
 static void cb_key_inserted(GtkEditable *editable, const gchar *, gint, gint *position, gpointer)
 {
     if (gtk_entry_get_visibility(GTK_ENTRY(editable)))
@@ -218,8 +219,8 @@ static void cb_key_deleted(GtkEditable *editable, gint, gint, gpointer)
     g_signal_stop_emission_by_name(editable, "delete-text");
 }
 
-// "backspace" of the key entry, before the entry's own handling: a hidden key goes as a whole, and
-// what is typed then can be read. Always FALSE.
+// "backspace" of the key entry, before the entry's own handler: removes a hidden key as a whole and
+// shows what is typed next. Always FALSE.
 static gboolean connect_key_cb(GdkEventKey *)
 {
     GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
@@ -227,7 +228,7 @@ static gboolean connect_key_cb(GdkEventKey *)
     if (entry == nullptr)
         return FALSE;
     if (!gtk_entry_get_visibility(entry)) {
-        // The backspace under way deletes this blank, so the cursor has to stand behind it.
+        // The backspace being handled deletes this space if the cursor is after it.
         gtk_entry_set_text(entry, " ");
         gtk_editable_set_position(GTK_EDITABLE(entry), -1);
     }
@@ -235,8 +236,8 @@ static gboolean connect_key_cb(GdkEventKey *)
     return FALSE;
 }
 
-// The key in the dialog, NULL without a dialog. An untouched stored key comes back byte for byte,
-// also where it is no UTF-8. g_free it.
+// The key in the dialog, NULL when the dialog is gone. An untouched stored key is returned byte for
+// byte, even if it is not UTF-8. g_free it.
 static gchar *entered_key()
 {
     GtkEntry *entry = GTK_ENTRY(find_widget(ENTRY_KEY));
@@ -252,7 +253,7 @@ static gchar *entered_key()
     return g_strdup(gtk_entry_get_text(entry));
 }
 
-// Reads the active item of the dialog's combo under `key` into `field` and prints it behind `name`.
+// Reads the active item of the combo under `key` into `field` and prints it after `name`.
 static void read_active(const char *key, guint32 *field, const char *name)
 {
     GtkWidget *combo = find_widget(key);
@@ -296,7 +297,7 @@ static void attach(GtkWidget *table, GtkWidget *widget, guint left, guint row)
                      PADDING, PADDING);
 }
 
-// A frame over the whole width of `row`; the box in it is returned.
+// Adds a frame across `row` and returns the box in it.
 static GtkWidget *attach_frame(GtkWidget *table, const gchar *title, guint row)
 {
     GtkWidget *frame = gtk_frame_new(title);
@@ -417,10 +418,10 @@ GtkWidget *create_encrypted_dialog(int *match_count)
     if (index != invalid_widget())
         register_named_widget(index, KEY_INDEX_KEY);
     cb_key_index_stat(nullptr, nullptr);
-    // This "changed" fills the first network in, so everything else stands by now.
+    // Emits "changed", which fills in the first network: everything else must exist by now.
     if (preferred != invalid_widget() && *match_count > 0)
         gtk_combo_box_set_active(GTK_COMBO_BOX(preferred), 0);
-    // Last, since the focus selects the whole key: what is typed at once replaces it.
+    // Last, because focusing selects the whole key, so that typing replaces it.
     gtk_widget_grab_focus(entry);
     return dialog;
 }

@@ -28,7 +28,7 @@
 // Long enough for the new status to be drawn before the commands block the window.
 constexpr guint COMMAND_DELAY_MS = 100;
 
-// The chosen network is not in the list any more: its key is for no other.
+// Reports that the chosen network is no longer listed; its key must not be used for another one.
 static void end_without_network()
 {
     debug_line("the chosen network is gone, it is not connected");
@@ -62,9 +62,9 @@ static void show_connecting()
     set_title_label(_("Connect network..."));
 }
 
-// One-shot timer: takes up the network that `data` (a WIFI_CELL) is a copy of, or with NULL the one
-// at connect_index, applies it and starts the link poller. A network that is gone ends the connect.
-// Always FALSE.
+// One-shot timer: finds the network that `data` (a WIFI_CELL) is a copy of, or with NULL takes the
+// one at connect_index, joins it and starts the link poller. When the network is gone the connect
+// ends. Always FALSE.
 static gboolean do_connect(gpointer data)
 {
     const WIFI_CELL *chosen = static_cast<const WIFI_CELL *>(data);
@@ -77,7 +77,7 @@ static gboolean do_connect(gpointer data)
             return FALSE;
         }
         take_answers_over(cell, chosen);
-        // A refresh that ended meanwhile has filled the list and given the controls back.
+        // A refresh that has ended in the meantime has filled the list and released its controls.
         if (!controls_held(HOLD_CONNECT))
             show_connecting();
     }
@@ -93,7 +93,7 @@ static gboolean do_disconnect(gpointer)
 {
     leave_network();
     send_status_to_desktop(STATUS_DISCONNECTED);
-    // A connect that began since the press has the list, the button and connect_index.
+    // A connect that has begun since then owns the list, the button and connect_index.
     if (controls_held(HOLD_CONNECT))
         return FALSE;
     review_tree_vanpro(_("Disconnect"));
@@ -124,10 +124,10 @@ static void start_connect(const WIFI_CELL *chosen)
     doubleclick = FALSE;
 }
 
-// Asks for the name of a network that hides it. FALSE: the network is gone.
+// Asks for the name of a hidden network. FALSE when the network is gone.
 static gboolean ask_name(WIFI_CELL *chosen)
 {
-    // The question stands on a window of its own, which is never shown.
+    // The parent of the question is a window of its own that is never shown.
     GtkWidget *parent = gtk_window_new(GTK_WINDOW_TOPLEVEL);
     g_autofree gchar *name = ask_text(parent, _("The essid is empty,Please input the Essid: "),
                                       _("Essid:"), ENTER_ANSWERS);
@@ -149,8 +149,8 @@ static gboolean ask_name(WIFI_CELL *chosen)
     return TRUE;
 }
 
-// Runs the dialog of an encrypted network and connects on OK. The network is looked for afresh
-// after each dialog, since a refresh may have lost it.
+// Runs the dialog of an encrypted network and connects on OK. A refresh may remove the network
+// while a dialog is open, so it is looked up again after each.
 static void connect_encrypted(WIFI_CELL *chosen)
 {
     int match_count = 0;
@@ -194,7 +194,7 @@ static void connect_selected()
 {
     debug_line("Choice to Connect index[%d],count[%d]", my_wifi->cell_index, my_wifi->cell_count);
     get_interface();
-    // Nothing is shown: a list without a device says enough, and the next refresh tells why.
+    // No message: the list shows that there is no device, and the next refresh says why.
     if (my_wifi->interface_count < 1)
         return;
     if (my_wifi->cell_count < 1) {
@@ -215,7 +215,7 @@ static void connect_selected()
         return;
     }
 
-    // By value: what happens while a dialog is open may replace the records.
+    // A copy, because the records may be replaced while a dialog is open.
     WIFI_CELL chosen = *cell;
 
     connect_network(&chosen);
@@ -226,8 +226,8 @@ void cb_connect(GtkWidget *, gpointer)
 {
     static gboolean running = FALSE;
 
-    // While a dialog of an earlier press is open only that one is answered. A double click comes
-    // here past the button, and what keeps that grey counts for both.
+    // Only one connect at a time may have a dialog open. A double click does not go through the
+    // button, so what keeps the button grey is checked here.
     if (running || controls_held(HOLD_CHECK | HOLD_REFRESH | HOLD_CONNECT | HOLD_HOST))
         return;
     running = TRUE;
@@ -235,7 +235,7 @@ void cb_connect(GtkWidget *, gpointer)
     running = FALSE;
 }
 
-// Makes the network under the pointer the selected one; a selected row is selected anew.
+// Selects the network under the pointer; a row that is selected already is selected again.
 static void follow_pointer(GtkTreeView *view, const GdkEventButton *event)
 {
     GtkTreePath *path = nullptr;

@@ -12,7 +12,7 @@
 #include <sys/ioctl.h>
 #include <sys/socket.h>
 #include <unistd.h>
-// It brings linux/if.h along, which can't stand beside net/if.h.
+// This includes linux/if.h, which conflicts with net/if.h.
 #include <linux/wireless.h>
 
 #include "base/state.h"
@@ -21,7 +21,7 @@
 #include "wifi_info/device.h"
 #include "wifi_info/text.h"
 
-// Puts a request for the interface that it names to the kernel. FALSE: errno says why.
+// Sends a request about the interface that it names. FALSE: errno has the reason.
 static gboolean ask_kernel(unsigned long code, struct ifreq *request)
 {
     const int fd = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
@@ -60,7 +60,7 @@ static gboolean interface_exists(const char *name)
 
 void get_ap_mac()
 {
-    // Kept for the next poll: this runs every two seconds of a connect.
+    // Kept open, because a connect polls every two seconds.
     static int fd = -1;
     const WIFI_INTERFACE *iface = first_interface();
     struct iwreq request = {};

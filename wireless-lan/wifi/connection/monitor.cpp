@@ -31,8 +31,8 @@ void connect_button_sensitive(gboolean flags)
                          my_wifi->interface_count == 0 && !controls_held(HOLD_REFRESH));
 }
 
-// Shows how a chain stands. The list and the title of a refresh under way, and those of a window
-// in Ad-Hoc host mode, are theirs.
+// Shows the progress of a chain. During a refresh, and in Ad-Hoc host mode, the list and the title
+// belong to those.
 static void show_state(const gchar *status, const gchar *title)
 {
     if (controls_held(HOLD_REFRESH | HOLD_HOST))
@@ -58,7 +58,7 @@ void give_controls_back()
     doubleclick = TRUE;
 }
 
-// The status text says that a connect has failed; a device that knows why has a word of its own.
+// Only says that the connect failed; a device that knows the reason supplies a better text.
 static void tell_reason()
 {
     g_autofree gchar *reason = device_reason();
@@ -67,9 +67,8 @@ static void tell_reason()
         show_warring_dialog(mainwindow, reason);
 }
 
-// The address of a window in Ad-Hoc host mode is the one that the device gave itself: a chain of
-// the settings ends there with nothing told and nothing shown. One that a press on Connect began
-// gives the controls back however it ends.
+// In Ad-Hoc host mode the device has given itself the address, so a chain of the settings ends
+// without a message. A chain that Connect began releases the controls in any case.
 static gboolean ends_unseen()
 {
     return controls_held(HOLD_HOST) && !controls_held(HOLD_CONNECT);
@@ -124,14 +123,14 @@ static void give_up_link()
     linkconnect = FALSE;
     send_status_to_desktop(STATUS_DISCONNECTED);
     debug_line("Not connect,return.");
-    // This one title is never translated; it stays as it is.
+    // This title alone is never translated.
     show_state(_("Not Connect"), "Wireless network selection");
 
     WIFI_CELL *cell = scanned_cell(connect_index);
 
     if (cell != nullptr)
         cell->linkstate = 2;
-    // doubleclick stays as it is: after a failure only the button connects again.
+    // doubleclick is unchanged: after a failure only the button connects again.
     connect_button_sensitive(TRUE);
     tell_reason();
 }

@@ -11,7 +11,7 @@
 #include "wifi_info/debug.h"
 #include "wifi_info/encryption.h"
 
-// Adds what is entered as the last row and selects it. FALSE: the user was told what is wrong.
+// Appends what was entered as a row and selects it. FALSE: a message has said what is wrong.
 static gboolean add_network(GtkWidget *dialog)
 {
     if (!form_has_essid(add_form, dialog) || !form_has_key(add_form, dialog))

@@ -17,7 +17,7 @@ static GtkWidget *create_delete_dialog(GtkWidget *parent, const gchar *name)
     GtkWidget *image = gtk_image_new_from_stock(GTK_STOCK_DIALOG_WARNING, GTK_ICON_SIZE_DIALOG);
     GtkWidget *label = gtk_label_new(nullptr);
     g_autofree gchar *escaped = g_markup_escape_text(name, -1);
-    // The misspelling is the one that the catalogues know.
+    // The catalogues contain the text with this spelling.
     g_autofree gchar *markup =
         g_strdup_printf("%s\n%s?", _("Do you want to detele the network"), escaped);
 
@@ -28,7 +28,7 @@ static GtkWidget *create_delete_dialog(GtkWidget *parent, const gchar *name)
     gtk_label_set_markup(GTK_LABEL(label), markup);
     gtk_label_set_justify(GTK_LABEL(label), GTK_JUSTIFY_CENTER);
     gtk_label_set_line_wrap(GTK_LABEL(label), TRUE);
-    // A long name without a blank must not push the buttons off the screen.
+    // A long name without spaces must not push the buttons off the screen.
     gtk_label_set_line_wrap_mode(GTK_LABEL(label), PANGO_WRAP_WORD_CHAR);
     gtk_misc_set_alignment(GTK_MISC(label), 0.0F, 0.5F);
 

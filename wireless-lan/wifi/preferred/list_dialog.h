@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The dialog with the preferred networks in their order of trial.
+// The dialog with the preferred networks, in the order in which they are tried.
 
 #ifndef WIFI_PREFERRED_LIST_DIALOG_H
 #define WIFI_PREFERRED_LIST_DIALOG_H

@@ -14,7 +14,7 @@
 #include "wifi.h"
 #include "wifi_info/debug.h"
 
-// WPA has no Ad-Hoc mode, no key state and no key index here; its key state counts as "open".
+// With WPA the form offers neither mode, key state nor key index; the key state is "open".
 static void follow_key_mgmt(const network_form &form, gboolean wpa)
 {
     set_widget_sensitive(form.mode_container, !wpa);
@@ -24,8 +24,8 @@ static void follow_key_mgmt(const network_form &form, gboolean wpa)
     set_widget_sensitive(form.key_hbox, wpa);
 }
 
-// "toggled" of WEP and WPA; they act on every toggle. The button that gains the choice is signalled
-// last and decides.
+// "toggled" of WEP and WPA. Each toggle emits two signals; the button that became active emits the
+// last one and decides.
 static void change_wep_type(GtkWidget *, gpointer)
 {
     follow_key_mgmt(add_form, FALSE);
@@ -82,7 +82,7 @@ const network_form properties_form = {
     change_prefer_wpa_type,
 };
 
-// A label that names `target` to assistive technology.
+// A label that is the accessible name of `target`.
 static GtkWidget *create_label(const char *text, GtkWidget *target)
 {
     GtkWidget *label = gtk_label_new(text);
@@ -91,7 +91,7 @@ static GtkWidget *create_label(const char *text, GtkWidget *target)
     return label;
 }
 
-// Attaches one row; its label names `target`, which is or stands in `control`.
+// Attaches one row. Its label names `target`, which is `control` or a widget inside it.
 static void attach_row(GtkWidget *table, guint row, const char *text, GtkWidget *control,
                        GtkWidget *target)
 {
@@ -208,8 +208,8 @@ GtkWidget *create_network_dialog(const network_form &form, GtkWidget *parent)
     return dialog;
 }
 
-// "toggled" of "off", "open" and "restricted": lets a key be entered for the latter two.
-// `user_data` is the key of the box around the key entry.
+// "toggled" of "off", "open" and "restricted": the latter two make the key editable. `user_data` is
+// the registry key of the box around the key entry.
 static void changed_enc_type(GtkToggleButton *togglebutton, gpointer user_data)
 {
     const auto key_hbox = static_cast<const char *>(user_data);

@@ -38,7 +38,8 @@ static void fill_form(gint row)
     set_active_number(find_widget(form.key_index), user_cell_text(row, LIST_KEY_INDEX));
 }
 
-// Toggling follows; a choice that stands already is not signalled, hence the direct calls.
+// Activating a radio button calls its handler, but one that is active already emits nothing: hence
+// the direct calls.
 static void choose_key_mgmt(gint row)
 {
     if (strcmp(user_cell_text(row, LIST_KEY_MGMT), "1") == 0) {
@@ -51,8 +52,8 @@ static void choose_key_mgmt(gint row)
     choose_form_radio(form.enc[row_encryption(row)]);
 }
 
-// Stores an entry in its column. An entry that was left as it was filled leaves the column alone:
-// it may hold bytes that the entry could not show.
+// Stores an entry in its column. An unchanged entry leaves the column alone, which may hold bytes
+// that the entry cannot show.
 static void store_entry(gint row, list_column column, const char *key)
 {
     g_autofree gchar *shown = displayable(user_cell_text(row, column));
@@ -62,8 +63,8 @@ static void store_entry(gint row, list_column column, const char *key)
         set_user_cell_text(row, column, text);
 }
 
-// Writes the form into the row, each column as soon as it is read: what stands before a refused
-// entry is in the row already. FALSE: the user was told what is wrong.
+// Writes the form into the row, column by column. When an entry is refused the columns before it
+// have been written already. FALSE: a message has said what is wrong.
 static gboolean store_network(gint row, GtkWidget *dialog)
 {
     store_entry(row, LIST_ALIAS, form.alias);

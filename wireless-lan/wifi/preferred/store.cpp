@@ -16,11 +16,11 @@
 #include "wifi_info/preferred_file.h"
 #include "wifi_info/text.h"
 
-// A reference of our own keeps both alive while no dialog shows them; the add prompt appends to
-// them then.
+// The store holds a reference to both lists, because the offer to keep a network appends to them
+// while no dialog shows them.
 static GtkWidget *front_list = nullptr;
 static GtkWidget *backend_list = nullptr;
-static gboolean file_is_unread = FALSE; // it could not be read whole, and has not been replaced
+static gboolean file_is_unread = FALSE; // it could not be read whole and has not been replaced yet
 
 static guint32 number_value(const char *text)
 {
@@ -32,8 +32,8 @@ static gchar *shown_name(const gchar *alias, const gchar *essid)
     return displayable(alias[0] != '\0' ? alias : essid);
 }
 
-// In a viewport the list does not ask for more room by itself once it has its full width, and new
-// rows would stay out of reach.
+// In a viewport a list that has its full width does not ask for more height by itself, and new rows
+// would be out of reach.
 static void front_changed_size()
 {
     gtk_widget_queue_resize(front_list);
@@ -118,9 +118,9 @@ static gboolean restore_highlight(gpointer)
     return FALSE;
 }
 
-// A click on the selected row takes its highlight away, yet the buttons still act on that row. The
-// list tells of it in the middle of the change, which may also be one to another row, so what is
-// missing comes back right after it.
+// Clicking the selected row removes its highlight, but the buttons still act on that row. The
+// signal comes in the middle of the change, which may be one to another row, so an idle callback
+// restores a missing highlight.
 static void cb_unselect_row(GtkWidget *, gint, gint, GdkEventButton *, gpointer)
 {
     g_idle_add_full(G_PRIORITY_HIGH_IDLE, restore_highlight, nullptr, nullptr);
@@ -177,8 +177,8 @@ void rebuild_user_cell_clist()
     create_lists(FALSE);
 }
 
-// Writes the file. One that could not be read whole holds networks that are not here: the user
-// decides, and is asked again at the next save after a No.
+// Writes the file. A file that could not be read whole holds networks that are not in memory, so
+// the user decides; after a No the next save asks again.
 static void write_records(GtkWidget *window)
 {
     const unread_answer answer =
@@ -234,8 +234,8 @@ void move_user_cell_row(gint row)
 
     gtk_clist_freeze(front);
     gtk_clist_swap_rows(front, my_wifi->user_cell_index, row);
-    // The list miscounts the row of the keyboard's focus when that stands below both rows, and may
-    // leave it behind the last one.
+    // GTK+ miscounts the focus row when it is below both swapped rows, and may move it past the
+    // last one.
     front->focus_row = row;
     gtk_clist_thaw(front);
     gtk_clist_swap_rows(GTK_CLIST(backend_list), my_wifi->user_cell_index, row);
@@ -257,7 +257,7 @@ void set_front_text(gint row, const gchar *alias, const gchar *essid)
 
 void select_user_cell_row(gint row)
 {
-    // The keyboard goes on from the selected row.
+    // Keyboard navigation continues from the selected row.
     GTK_CLIST(front_list)->focus_row = row;
     gtk_clist_select_row(GTK_CLIST(front_list), row, 0);
 }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// The preferred networks as rows of two column lists, which the dialogs edit, and their way back
-// into records and file. Row i of both lists and record i are the same network.
+// The preferred networks as rows of two column lists, which the dialogs edit and which are written
+// back to the records and the file. Row i of both lists and record i are the same network.
 
 #ifndef WIFI_PREFERRED_STORE_H
 #define WIFI_PREFERRED_STORE_H
@@ -10,7 +10,7 @@
 constexpr char FRONT_KEY[] = "user_cell_list_front";
 constexpr char BACKEND_KEY[] = "user_cell_list_backend";
 
-// Columns of the backend list, which is never drawn: its texts are bytes, as in the records.
+// Columns of the backend list. It is never drawn, so its texts are bytes, as in the records.
 enum list_column {
     LIST_ALIAS,
     LIST_ESSID,
@@ -22,29 +22,30 @@ enum list_column {
     LIST_COLUMNS
 };
 
-// Reads the records from the file, and remembers whether that was all of it.
+// Reads the records from the file and remembers whether that was all of it.
 void load_user_cells();
 
-// Builds both lists from the records, registers them and returns the front list (one column: the
-// alias, or the name where it is empty, as valid UTF-8). Nothing is selected. The store owns both
-// lists; the former pair is destroyed.
+// Builds both lists from the records, registers them and returns the front list. Its only column
+// shows the alias, or the name where the alias is empty, as valid UTF-8. No row is selected. The
+// store owns both lists and destroys the previous ones.
 GtkWidget *build_user_cell_clist();
 
-// The same without a line on standard output: edits that were not saved are gone.
+// The same without output on standard output: discards edits that were not saved.
 void rebuild_user_cell_clist();
 
-// TRUE while both lists are registered; what follows works on lists that are.
+// TRUE while both lists are registered. The functions below need both unless they say otherwise.
 gboolean user_cell_lists_exist();
 
-// Copies the backend rows into the records and writes the file; asks the user first when it could
-// not be read whole, and tells when it could not be written. Does nothing while a list is missing.
+// Copies the backend rows to the records and writes the file. It asks first when the file could not
+// be read whole, and shows a message when it could not be written. Without both lists it does
+// nothing.
 void save_user_cell_clist();
 
-// Appends one network to both lists and counts it; its row becomes user_cell_index. FALSE, with
-// nothing added, when 64 networks are there or a list is missing.
+// Appends a network to both lists; its row becomes user_cell_index. FALSE, with nothing changed,
+// when there are 64 networks already or a list is missing.
 gboolean append_user_cell_row(const gchar *const ftext[LIST_COLUMNS]);
 
-// A row's text of a column list, "" when the cell has none. The list owns it.
+// A cell's text in a column list, "" when it has none. The list owns it.
 const gchar *clist_text(GtkWidget *clist, gint row, gint column);
 
 // The text of a backend column; the list owns it until the column is set.
@@ -53,23 +54,23 @@ const gchar *user_cell_text(gint row, list_column column);
 // Sets a backend column.
 void set_user_cell_text(gint row, list_column column, const gchar *text);
 
-// Removes row `row` of both lists and counts it out; selects nothing.
+// Removes a row from both lists. Nothing is selected afterwards.
 void remove_user_cell_row(gint row);
 
-// Swaps the selected row with its neighbour `row` in both lists; the selection and its highlight go
-// with the network.
+// Swaps the selected row with its neighbour `row` in both lists. The selection moves with the
+// network.
 void move_user_cell_row(gint row);
 
-// What the front list shows of a row.
+// The text of a row of the front list.
 const gchar *front_text(gint row);
 
-// Shows a network's alias, or its name where that is empty, in front row `row`.
+// Sets the text of a row of the front list to the alias, or to the name where the alias is empty.
 void set_front_text(gint row, const gchar *alias, const gchar *essid);
 
-// Selects and highlights row `row` of the front list as a click does.
+// Selects a row of the front list as a click does.
 void select_user_cell_row(gint row);
 
-// Shows the message for a list that is full over `parent`.
+// Shows over `parent` the message that the list is full.
 void show_store_full(GtkWidget *parent);
 
 #endif

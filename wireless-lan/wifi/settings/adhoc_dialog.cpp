@@ -12,8 +12,8 @@
 #include "wifi.h"
 #include "wifi_info/text.h"
 
-// Only the ESSID is shown. The other widgets are never placed in the window: they carry the
-// network's encryption and key from the record to OK, which stores them again.
+// Only the ESSID is shown. The other widgets are never placed: they carry encryption and key from
+// the record to OK, which stores them again.
 struct group_form {
     GtkWidget *essid;
     GtkWidget *key;
@@ -42,8 +42,8 @@ static GtkWidget *create_entry(const char *text)
     return entry;
 }
 
-// Copies the entry's text into the field that it was filled from. A text left as it was shown
-// leaves the field alone: its bytes need not be UTF-8.
+// Stores an entry in the field that it was filled from. An unchanged entry leaves the field alone,
+// whose bytes need not be UTF-8.
 static void take_entry(GtkWidget *entry, char *field, gsize size)
 {
     const gchar *text = gtk_entry_get_text(GTK_ENTRY(entry));
@@ -120,12 +120,13 @@ static GtkWidget *create_group_dialog()
     GtkWidget *dialog = create_dialog(_("Ad-Hoc Information"), nullptr, DEFAULT_NONE);
 
     gtk_window_set_policy(GTK_WINDOW(dialog), FALSE, FALSE, TRUE);
-    // Without a parent only this keeps it above the settings dialog, which is blocked meanwhile.
+    // Without a parent nothing else keeps it above the settings dialog, which is blocked while it
+    // runs.
     gtk_window_set_keep_above(GTK_WINDOW(dialog), TRUE);
     return dialog;
 }
 
-// Stores what the form holds; what is stored before a refusal stays. FALSE: run the dialog again.
+// Stores the form. What is stored before a value is refused stays. FALSE: run the dialog again.
 static gboolean store_group(GtkWidget *dialog, const group_form *form, WIFI_CELL *group_info)
 {
     if (is_empty(form->essid)) {

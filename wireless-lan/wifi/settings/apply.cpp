@@ -23,7 +23,7 @@
 #include "wifi_info/shell.h"
 #include "wifi_info/text.h"
 
-// Time for the new settings to reach the interface before its address is looked at.
+// The time that the interface needs to take the new settings.
 constexpr guint FOLLOW_MS = 4000;
 
 const address_setting address_settings[4] = {
@@ -51,7 +51,7 @@ gboolean address_is_valid(const gchar *ip)
 
     if (ip == nullptr)
         return FALSE;
-    errno = EINVAL; // inet_pton has no error of its own for a malformed text
+    errno = EINVAL; // inet_pton sets none for a malformed address
     if (inet_pton(AF_INET, ip, &address) == 1)
         return TRUE;
     perror("inet_pton");
@@ -69,7 +69,7 @@ static gboolean take_static_addresses(GtkWidget *dialog, WIFI_INTERFACE *iface)
         const gchar *text = gtk_entry_get_text(GTK_ENTRY(entry));
 
         if (!address_is_valid(text)) {
-            gtk_widget_grab_focus(entry); // the message does not say which value it means
+            gtk_widget_grab_focus(entry); // the message does not name the value
             show_message_box(dialog, _("Settings invalid"));
             return FALSE;
         }
@@ -98,7 +98,7 @@ static void enter_host_mode(const WIFI_INTERFACE *iface)
     send_status_to_desktop(STATUS_ASSOCIATED);
 }
 
-// FALSE: there is no association, so no address to ask for.
+// FALSE when the interface is not associated and needs no address.
 static gboolean enter_selection_mode()
 {
     release_controls(HOLD_HOST);
@@ -118,14 +118,14 @@ static gboolean enter_selection_mode()
     return TRUE;
 }
 
-static gboolean file_is_unread = FALSE; // it could not be read whole, and has not been replaced
+static gboolean file_is_unread = FALSE; // it could not be read whole and has not been replaced yet
 
 void load_settings()
 {
     file_is_unread = !get_basic_setting_from_file(SETTINGS_FILE);
 }
 
-// FALSE when they could not be written; a user who wants to keep the old file has decided so.
+// FALSE when they could not be written. A user who keeps the old file has decided so: TRUE.
 static gboolean write_settings(GtkWidget *dialog)
 {
     const unread_answer answer =
@@ -148,7 +148,8 @@ int Save_Basic_Setting(GtkWidget *dialog)
     take_check_state("auto_dns", iface, &iface->auto_dns);
     take_check_state("adhoc-host", iface, &iface->wifi_group_enable);
 
-    // What is not stored is applied all the same: it holds until the device is switched off.
+    // Settings that are not stored are applied all the same and last until the device is switched
+    // off.
     if (!interface_usable(iface->name, "saving the settings") || !write_settings(dialog))
         show_message_box(dialog, _("The settings could not be saved."));
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Taking the settings over: validate, store, write, apply.
+// Applying the settings: validate, store, write, run.
 
 #ifndef WIFI_SETTINGS_APPLY_H
 #define WIFI_SETTINGS_APPLY_H
@@ -8,7 +8,7 @@
 
 #include "wifi.h"
 
-// One address of static addressing: its row in the dialog and the two places that keep its text.
+// One address of static addressing, and the two places that keep its text.
 struct address_setting {
     const char *prefix; // of the entry's key, and the entry's widget name
     gchar (*text)[32];
@@ -17,21 +17,22 @@ struct address_setting {
 
 extern const address_setting address_settings[4]; // in the order of the rows
 
-// The key of a widget of the settings dialog: `prefix` followed by the interface's name. g_free it.
+// The registry key of a widget of the settings dialog: `prefix` and the name of the interface.
+// g_free it.
 gchar *settings_key(const char *prefix, const char *iface_name);
 
-// The widget under that key, NULL when there is none: a dialog's widgets carry the name that the
-// interface had when it opened.
+// The widget under that key, NULL when there is none. The keys have the name that the interface had
+// when the dialog opened.
 GtkWidget *find_settings_widget(const char *prefix, const char *iface_name);
 
-// Reads the settings from their file, and remembers whether that was all of it.
+// Reads the settings from their file and remembers whether that was all of it.
 void load_settings();
 
-// Takes over what the settings dialog shows. 0: a value was refused, with a message over `dialog`,
-// and nothing was written; 1: done.
+// Applies what the settings dialog shows. 1: done. 0: a value was refused with a message over
+// `dialog`, and nothing was written.
 int Save_Basic_Setting(GtkWidget *dialog);
 
-// TRUE for an IPv4 address in dotted-decimal form (inet_pton); otherwise the reason goes to
+// TRUE for an IPv4 address in dotted-decimal form (inet_pton). Otherwise FALSE, with the reason on
 // standard error. NULL gives FALSE.
 gboolean address_is_valid(const gchar *ip);
 

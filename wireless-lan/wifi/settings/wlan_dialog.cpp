@@ -16,9 +16,9 @@
 #include "wifi_info/interfaces.h"
 #include "wifi_info/text.h"
 
-static GtkTooltips *tooltips = nullptr; // one object for every opening
+static GtkTooltips *tooltips = nullptr; // shared by all openings of the dialog
 
-// What the rows of the addresses say, in the order of address_settings.
+// The texts of the address rows, in the order of address_settings.
 static const struct {
     const char *label;
     const char *tooltip;
@@ -44,8 +44,8 @@ static void static_entry_status(gboolean flag, const gchar *iface_name)
         set_setting_sensitive(setting.prefix, iface_name, flag);
 }
 
-// Works on the selected interface, while the dialog shows the first one: with another one selected
-// none of the dialog's widgets is found.
+// This works on the selected interface, but the dialog shows the first one. With another one
+// selected it finds none of the dialog's widgets.
 static void changed_address_type(GtkToggleButton *togglebutton, gpointer)
 {
     const int index = my_wifi->interface_index;
@@ -88,7 +88,7 @@ static GtkWidget *create_type_radio(const WIFI_INTERFACE *iface, GSList *group, 
     g_autofree gchar *key = settings_key(prefix, iface->name);
 
     register_named_widget(radio, key);
-    // The registry shares the radio button until it is destroyed or its key is taken over.
+    // The registry holds a reference until the button is destroyed or its key is reused.
     g_object_set_data_full(G_OBJECT(mainwindow), key, g_object_ref(radio), g_object_unref);
     return radio;
 }
@@ -100,7 +100,7 @@ static GtkWidget *create_type_radios(const WIFI_INTERFACE *iface)
     GtkWidget *fixed = create_type_radio(iface, gtk_radio_button_get_group(GTK_RADIO_BUTTON(dhcp)),
                                          "static", _("static"));
 
-    // A radio button is switched off by another of its group only, so both are there by now.
+    // A radio button can only be switched off by another one of its group, so both must exist.
     set_active(dhcp, iface->isdhcp);
     set_active(fixed, iface->isstatic);
     for (GtkWidget *radio : {dhcp, fixed}) {
@@ -207,7 +207,7 @@ void cb_wifi_settings(GtkWidget *, gpointer)
 
     GtkWidget *dialog = begin_dialog(create_settings_dialog(first_interface()));
 
-    // A refusal keeps the dialog, unless it has gone together with the main window.
+    // A refused value keeps the dialog open, unless it went away with the main window.
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK &&
            Save_Basic_Setting(dialog) == 0 && mainwindow != nullptr) {
     }

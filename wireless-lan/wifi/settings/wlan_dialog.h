@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The dialog with the addressing of the interface and the switch of Ad-Hoc hosting.
+// The dialog for the addressing of the interface and for hosting an Ad-Hoc network.
 
 #ifndef WIFI_SETTINGS_WLAN_DIALOG_H
 #define WIFI_SETTINGS_WLAN_DIALOG_H

@@ -16,7 +16,7 @@
 
 constexpr char CHECKING_KEY[] = "window-proc-win";
 constexpr char MARKER_FILE[] = "/etc/build_in_wifi";
-// The module takes up to six seconds until its interface appears.
+// The interface appears up to six seconds after the module is switched on.
 constexpr guint POWER_ON_MS = 6050;
 constexpr guint BORDER = 10; // of the checking window, pixels
 

@@ -6,8 +6,8 @@
 
 #include <gtk/gtk.h>
 
-// "clicked" of "Active WIFI", and the first job after start: switches a built-in module on where no
-// interface is found, otherwise refreshes the list at once.
+// "clicked" of "Active WIFI", also called once after the start: switches a built-in module on when
+// there is no interface, otherwise refreshes the list.
 void cb_active_device(GtkWidget *widget, gpointer data);
 
 #endif

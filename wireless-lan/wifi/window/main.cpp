@@ -19,7 +19,7 @@
 #include "window/main_window.h"
 
 constexpr char TEXT_DOMAIN[] = "wireless-lan";
-// A window that is not shown (started as an icon) still gets its first scan.
+// When a window that starts as an icon gets its first scan.
 constexpr guint UNSEEN_MS = 1000;
 
 static void cb_leave(GtkWidget *, gpointer)
@@ -28,16 +28,16 @@ static void cb_leave(GtkWidget *, gpointer)
     gtk_main_quit();
 }
 
-// A closed window just goes with the process: to destroy all its rows first would only take time.
+// A closed window ends with the process; destroying all its rows first would only take time.
 static gboolean cb_close(GtkWidget *, GdkEvent *, gpointer)
 {
     gtk_main_quit();
     return TRUE;
 }
 
-static guint unseen_timer = 0; // 0: it has fired or is not needed any more
+static guint unseen_timer = 0; // 0: it has fired, or is not needed
 
-// The commands of a device that tells reasons are for root alone.
+// Only root may run the commands of a device that reports reasons.
 static void tell_missing_rights()
 {
     if (!has_device_path() || geteuid() == 0)
@@ -48,9 +48,9 @@ static void tell_missing_rights()
     show_warring_dialog(mainwindow, reason);
 }
 
-// Queues the jobs behind the first picture, since the scan blocks the window. What became visible
-// was exposed at the same time, so after a round trip to the X server the exposures are here, and
-// they are drawn before idle jobs run.
+// Starts the jobs after the first drawing, because the scan blocks the window. What became visible
+// was exposed with it, so one round trip to the X server brings the expose events, which GTK+
+// handles before idle callbacks.
 static gboolean start_jobs(gpointer)
 {
     unseen_timer = 0;
@@ -69,8 +69,7 @@ static gboolean start_jobs(gpointer)
     return FALSE;
 }
 
-// The first expose-event would say less: it comes of GTK+ itself, before the window manager shows
-// the window.
+// Not the first expose-event: GTK+ sends that itself, before the window manager shows the window.
 static gboolean cb_first_sight(GtkWidget *widget, GdkEvent *, gpointer)
 {
     g_signal_handlers_disconnect_by_func(widget, reinterpret_cast<gpointer>(cb_first_sight),
@@ -84,7 +83,7 @@ static gboolean cb_first_sight(GtkWidget *widget, GdkEvent *, gpointer)
 
 int main(int argc, char **argv)
 {
-    // In a pipe, too, a line leaves when it is written.
+    // Each line is written at once, even to a pipe.
     setvbuf(stdout, nullptr, _IOLBF, 0);
     set_device_path(PROGRAM_DEVICE_PATH);
     bindtextdomain(TEXT_DOMAIN, PROGRAM_LOCALEDIR);

@@ -147,8 +147,8 @@ GtkWidget *create_list()
 
 void set_default_width(GtkWindow *window)
 {
-    // A view takes the height of the first rows that it ever measures in a model as that of all the
-    // others, and so knows at once how long the list is; the sample must not use that up.
+    // A tree view measures the first rows of a model once and takes their height for all rows; the
+    // sample must not use up that measurement.
     GtkTreeView *view = GTK_TREE_VIEW(my_wifi->wifi_view);
     GtkTreeModel *model = gtk_tree_view_get_model(view);
     GtkTreeModel *sample = create_model();

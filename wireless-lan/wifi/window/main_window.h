@@ -6,14 +6,14 @@
 
 #include <gtk/gtk.h>
 
-// The left half: the four buttons. The configuration is loaded while it is built.
+// The left half: the four buttons. Loads the configuration on the way.
 GtkWidget *create_left_text();
 
 // The right half: status label, network list, Connect button.
 GtkWidget *create_list();
 
-// Makes the window, when it is first shown, as wide as the five columns with a connected row in
-// them need, where the screen has room. Both halves must be in it and shown.
+// Sets the default width so that the five columns fit with a connected row in them, as far as the
+// screen allows. Both halves must be packed and shown.
 void set_default_width(GtkWindow *window);
 
 #endif

@@ -20,7 +20,7 @@
 #include "wifi_info/scan.h"
 #include "wifi_info/text.h"
 
-// Long enough for "Searching..." to be drawn before the scan blocks the window.
+// Long enough to draw "Searching..." before the scan blocks the window.
 constexpr guint SCAN_DELAY_MS = 100;
 
 static void show_no_device()
@@ -30,8 +30,8 @@ static void show_no_device()
     debug_line("No interface");
 }
 
-// Sets connect_index to the last network whose access point is the one the interface is with, and
-// the status text that the list shows for it.
+// Sets connect_index to the last network whose access point is the current one, and `status` to its
+// text in the list.
 static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize size)
 {
     connect_index = -1;
@@ -68,7 +68,7 @@ static gboolean cb_refresh(gpointer)
     WIFI_INTERFACE *iface = first_interface();
     char status[STATUS_TEXT_SIZE] = "";
 
-    // The settings were confirmed meanwhile, and the device hosts a network: nothing is scanned.
+    // The settings dialog has switched to hosting in the meantime: nothing is scanned.
     if (controls_held(HOLD_HOST)) {
         release_controls(HOLD_REFRESH);
         return FALSE;

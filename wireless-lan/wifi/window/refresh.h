@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Scanning, matching the access point, filling the list.
+// The refresh: scan, match the access point, fill the list.
 
 #ifndef WIFI_WINDOW_REFRESH_H
 #define WIFI_WINDOW_REFRESH_H

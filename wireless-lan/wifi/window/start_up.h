@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What is loaded while the window is built.
+// Loading the configuration at start-up.
 
 #ifndef WIFI_WINDOW_START_UP_H
 #define WIFI_WINDOW_START_UP_H
