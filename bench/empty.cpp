@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Floor: an empty GTK+ 2 window.
+// A floor to measure against: an empty GTK+ 2 window.
 
 #include <gtk/gtk.h>
 

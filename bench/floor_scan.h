@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The least that a refresh can do: read the two pipes, put the rows in.
+// The least work of a refresh: read the two pipes, fill in the rows.
 
 #ifndef BENCH_FLOOR_SCAN_H
 #define BENCH_FLOOR_SCAN_H
@@ -9,16 +9,17 @@
 constexpr int FLOOR_ROWS = 128;
 
 struct floor_row {
-    char texts[5][64]; // as shown, column by column
+    char texts[5][64]; // as shown, one a column
 };
 
-// Reads "cat /proc/net/wireless"; the first interface's name goes to `name`. FALSE: none.
+// Reads "cat /proc/net/wireless" and stores the name of the first interface in `name`. FALSE when
+// there is none.
 gboolean read_interface_name(char (&name)[16]);
 
-// Reads "iwlist NAME scan" into `rows` and returns how many there are.
+// Reads "iwlist NAME scan" into `rows` and returns their number.
 int read_scan(const char *name, floor_row (&rows)[FLOOR_ROWS]);
 
-// Replaces what the list shows.
+// Replaces the rows of the list.
 void fill_rows(GtkListStore *store, const floor_row *rows, int count);
 
 #endif

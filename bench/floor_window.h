@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The widgets of the main window and nothing else, written straight down.
+// The widgets of the main window and nothing else.
 
 #ifndef BENCH_FLOOR_WINDOW_H
 #define BENCH_FLOOR_WINDOW_H
@@ -7,12 +7,12 @@
 #include <gtk/gtk.h>
 
 struct floor_window {
-    GtkWidget *window; // not yet shown; destroying it leaves the main loop
+    GtkWidget *window; // not shown yet; destroying it ends the main loop
     GtkListStore *rows;
 };
 
-// The window's size comes from the command line (WIDTH HEIGHT, optional), so that the floor covers
-// as many pixels as the program.
+// The command line may give the size of the window (WIDTH HEIGHT), so that the floor covers as many
+// pixels as the program.
 floor_window make_floor_window(int argc, char **argv);
 
 #endif

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Floor: the main window's widgets, the two helper processes of start-up, and after the first
-// picture one discovery, the 100 ms pause, the scan and its rows.
+// A floor to measure against: the widgets of the main window, the two helper processes of start-up,
+// and after the first drawing one discovery, the 100 ms pause, the scan and its rows.
 
 #include <cstdlib>
 

@@ -13,8 +13,8 @@
 #include "wifi_info/scan.h"
 #include "wifi_info/text.h"
 
-// get_cell brings the interface up first. That is a shell and a command of its own, and no part of
-// what is compared here; nothing else in this program uses it.
+// get_cell brings the interface up first, with a shell and a command that are no part of the
+// comparison. Nothing else in this program uses this function.
 extern "C" int system(const char *)
 {
     return 0;

@@ -40,9 +40,9 @@
 #include <X11/extensions/XTest.h>
 #include <X11/extensions/Xdamage.h>
 
-// Nothing measured here takes longer, even under an instruction counter.
+// Longer than anything that is measured here, even under an instruction counter.
 static const double LIMIT_MS = 120000;
-// The program waits so long between the press and the scan.
+// The pause of the program between a press and the scan.
 static const double PAUSE_MS = 100;
 static const char TITLE[] = "Wireless LAN";
 
@@ -50,11 +50,11 @@ static Display *display;
 static int damage_event;
 static pid_t child;
 static double start_ms;
-static double last_drawn_ms; // since the start; negative: nothing yet
+static double last_drawn_ms; // since the start; negative: nothing has been drawn
 
 struct scan_log {
     int fd;
-    char rest[4096]; // the line that is not complete yet
+    char rest[4096]; // the start of an incomplete line
     size_t length;
     long scanning_pid;
     int ended;
@@ -117,7 +117,8 @@ static bool child_lives()
            info.si_pid == 0;
 }
 
-// Takes what has been drawn, waiting up to `wait_ms` for it; each piece is answered when `tell`.
+// Reads what has been drawn, waiting up to `wait_ms` for it, and reports each area if `tell` is
+// set.
 static void take_damage(int wait_ms, bool tell)
 {
     struct pollfd server = {ConnectionNumber(display), POLLIN, 0};
@@ -189,7 +190,7 @@ static bool tell_window()
     return true;
 }
 
-// Where the left column and the pane's handle have ended.
+// A position past the left column and the handle of the pane.
 static const int LIST_SIDE_X = 260;
 
 static bool tell_picture(const char *file)
@@ -249,8 +250,8 @@ struct place {
     int x, y;
 };
 
-// The buttons stand below each other in the left column, Refresh first: the first place from the
-// top where a press begins a scan. Leaves the list filled.
+// Finds the Refresh button, the first one in the left column: the first place from the top where a
+// press begins a scan. Leaves the list filled.
 static bool find_refresh_button(place *button)
 {
     XWindowAttributes attributes;
@@ -277,8 +278,8 @@ static bool refresh_once(const place &button)
     const double deadline = now_ms() + LIMIT_MS;
     double pressed = -1e9;
 
-    // What the press itself changes is drawn at once, the list after the pause before the scan. A
-    // press that met a button which was not sensitive yet is made again.
+    // The press changes something at once, and the list after the pause before the scan. A press on
+    // a button that was not sensitive yet is repeated.
     while (device_log.ended == ended || start_ms + last_drawn_ms < pressed + PAUSE_MS) {
         if (now_ms() > deadline || !child_lives())
             return false;
@@ -291,7 +292,7 @@ static bool refresh_once(const place &button)
     return settle(20, 0, false);
 }
 
-// Finding the button takes the first of them.
+// Finding the button has done the first of them.
 static bool refresh(int times)
 {
     static place button;
@@ -314,7 +315,7 @@ static double milliseconds(const struct timeval &time)
     return static_cast<double>(time.tv_sec) * 1e3 + static_cast<double>(time.tv_usec) / 1e3;
 }
 
-// To every window that knows the message, as a window manager's close button would.
+// Sent to every window that supports the message, like the close button of a window manager.
 static void ask_to_close()
 {
     Window root, parent, *windows = nullptr;
@@ -354,7 +355,7 @@ static bool close_windows()
     struct rusage used = {};
     int status = 0;
 
-    // A window with a modal dialog above it takes the message only when that is gone.
+    // A window below a modal dialog handles the message only when the dialog has gone.
     while (child_lives() && now_ms() < deadline) {
         if (now_ms() - asked > 200) {
             ask_to_close();
@@ -399,7 +400,7 @@ static bool watch_display()
         fputs("watch: no display, or one without the DAMAGE extension\n", stderr);
         return false;
     }
-    // A window may go while it is asked for its place.
+    // A window may disappear while its position is read.
     XSetErrorHandler([](Display *, XErrorEvent *) { return 0; });
     damage_event += XDamageNotify;
     XDamageCreate(display, DefaultRootWindow(display), XDamageReportRawRectangles);

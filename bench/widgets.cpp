@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Floor: the main window's widgets, no logic.
+// A floor to measure against: the widgets of the main window, no logic.
 
 #include "floor_window.h"
 

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// The basic settings: read over flags that the first byte chooses, written and read again.
+// The settings file: read into a record with the flags that the first byte gives, written, and read
+// again.
 
 #include "wifi_info/basic_settings.h"
 #include "fuzz.h"

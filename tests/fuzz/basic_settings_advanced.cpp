@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The settings in the other form.
+// The settings in the general form.
 
 #include "fuzz.h"
 #include "support/model.h"

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A text in a field of the size that the first byte gives, and once more from inside the field.
+// Copies a text to a field of the size that the first byte gives, then once more from inside the
+// field.
 
 #include "fuzz.h"
 #include "support/model.h"

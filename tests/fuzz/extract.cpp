@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The two value extractors: the first byte chooses `unit`, the first line is the keyword.
+// The two value extractors. The first byte chooses `unit`, the first line is the keyword.
 
 #include "fuzz.h"
 #include "support/model.h"
@@ -12,12 +12,12 @@ static void check(const std::string &line, const std::string &keyword, bool unit
     g_autofree gchar *src = g_strdup(line.c_str());
     g_autofree gchar *value = extract(src, keyword.c_str(), unit);
     size_t at = line.find(keyword);
-    std::string behind =
+    std::string after =
         at == std::string::npos ? "" : model::trim(line.substr(at + keyword.size()));
-    CHECK((value != nullptr) == !behind.empty());
+    CHECK((value != nullptr) == !after.empty());
     if (!value)
         return;
-    std::vector<std::string> pieces = model::split(behind, separator);
+    std::vector<std::string> pieces = model::split(after, separator);
     CHECK(value == (unit && pieces.size() > 1 ? pieces[0] + " " + pieces[1] : pieces[0]));
 }
 

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// A variable out of a file: the first line is the variable, the rest the file. The same input as a
-// parameter line.
+// A variable from a file: the first line is its name, the rest is the file. The whole input also
+// serves as a parameter line.
 
 #include <algorithm>
 

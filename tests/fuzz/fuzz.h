@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What the fuzz targets share: an input as a stream or a file, and a check that ends the run.
+// What the fuzz targets share: the input as a stream or a file, and a check that aborts.
 
 #ifndef TESTS_FUZZ_FUZZ_H
 #define TESTS_FUZZ_FUZZ_H
@@ -11,7 +11,7 @@
 
 #include <unistd.h>
 
-// libFuzzer or the replay program calls it with one input.
+// Called by libFuzzer, or by the replay program, with one input.
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size);
 
 #define CHECK(condition)                                                                           \
@@ -28,7 +28,7 @@ inline std::string input_text(const uint8_t *data, size_t size)
     return std::string(reinterpret_cast<const char *>(data), size);
 }
 
-// A stream over `text`, which has to outlive it.
+// A stream that reads `text`, which must outlive it.
 inline FILE *open_input(const std::string &text)
 {
     FILE *stream = fmemopen(const_cast<char *>(text.data()), text.size(), "r");
@@ -36,13 +36,13 @@ inline FILE *open_input(const std::string &text)
     return stream;
 }
 
-// The path of a file of this process in memory.
+// The path of an in-memory file of this process.
 inline std::string scratch_path()
 {
     return "/dev/shm/wireless-lan-fuzz-" + std::to_string(getpid());
 }
 
-// A file that holds `text`.
+// A file with the content `text`.
 inline std::string write_scratch(const std::string &text)
 {
     std::string path = scratch_path();

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The preferred networks: read, written and read again.
+// The file of the preferred networks: read, written and read again.
 
 #include "wifi_info/preferred_file.h"
 #include "fuzz.h"

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Runs a fuzz target over every file of the folders given: the corpus as a plain test.
+// Runs a fuzz target on every file of the given directories, so that the corpus serves as a plain
+// test.
 
 #include <glib.h>
 
@@ -9,9 +10,9 @@ int main(int argc, char **argv)
 {
     int inputs = 0;
     for (int i = 1; i < argc; i++) {
-        g_autoptr(GDir) folder = g_dir_open(argv[i], 0, nullptr);
-        CHECK(folder != nullptr);
-        while (const gchar *name = g_dir_read_name(folder)) {
+        g_autoptr(GDir) directory = g_dir_open(argv[i], 0, nullptr);
+        CHECK(directory != nullptr);
+        while (const gchar *name = g_dir_read_name(directory)) {
             g_autofree gchar *path = g_build_filename(argv[i], name, nullptr);
             g_autofree gchar *content = nullptr;
             gsize length;

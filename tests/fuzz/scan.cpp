@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The output of iwlist, read twice over: the second scan releases the records of the first.
+// The output of iwlist, read twice: the second scan frees the records of the first.
 
 #include "wifi_info/scan.h"
 #include "fuzz.h"

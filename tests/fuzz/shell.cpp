@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Text inside command lines: a shell makes one word of it, the same text.
+// Text in command lines: a shell must read it as one word with the same content.
 
 #include "wifi_info/shell.h"
 #include "fuzz.h"

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Saves one of the two files and nothing else: save basic|preferred FILE old|new|short. Exit status
-// 0: saved, 1: not saved, with the cause on standard error.
+// Saves one of the two files: save basic|preferred FILE old|new|short. Exit status 0: saved; 1: not
+// saved, with the reason on standard error.
 
 #include <cstring>
 
@@ -33,7 +33,7 @@ int main(int argc, char **argv)
         fill(cell->alias, sizeof cell->alias, byte);
         fill(cell->essid, sizeof cell->essid, byte);
     }
-    getppid(); // the save begins after this system call
+    getppid(); // marks the beginning of the save for strace
     bool basic = strcmp(argv[1], "basic") == 0;
     gboolean saved =
         basic ? save_basic_setting_to_file(argv[2]) : save_preferred_network_to_file(argv[2]);

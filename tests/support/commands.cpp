@@ -49,7 +49,7 @@ char *__wrap_gettext(const char *text)
     return translate(text);
 }
 
-// What gettext() turns into where the compiler optimises.
+// Optimising compilers replace gettext() by this.
 char *__wrap_dcgettext(const char *, const char *text, int)
 {
     return translate(text);
@@ -63,40 +63,40 @@ int real_system(const std::string &command)
 
 namespace
 {
-struct temporary_folder {
+struct temporary_directory {
     std::string path;
-    explicit temporary_folder(const std::string &parent)
+    explicit temporary_directory(const std::string &parent)
         : path(parent + "/wireless-lan-unit-XXXXXX")
     {
         if (!mkdtemp(path.data()))
             abort();
     }
-    ~temporary_folder()
+    ~temporary_directory()
     {
         std::filesystem::remove_all(path);
     }
 };
 } // namespace
 
-const std::string &scratch_folder()
+const std::string &scratch_directory()
 {
-    static temporary_folder folder("/tmp");
-    return folder.path;
+    static temporary_directory directory("/tmp");
+    return directory.path;
 }
 
-const std::string &memory_folder()
+const std::string &memory_directory()
 {
-    static temporary_folder folder(access("/dev/shm", W_OK) == 0 ? "/dev/shm" : "/tmp");
-    return folder.path;
+    static temporary_directory directory(access("/dev/shm", W_OK) == 0 ? "/dev/shm" : "/tmp");
+    return directory.path;
 }
 
-// Our own tools stand first on the path.
-static std::string tool_folder()
+// The tests' own tools come first in PATH.
+static std::string tool_directory()
 {
-    std::string folder = scratch_folder() + "/bin";
-    if (std::filesystem::create_directory(folder))
-        setenv("PATH", (folder + ":" + getenv("PATH")).c_str(), 1);
-    return folder;
+    std::string directory = scratch_directory() + "/bin";
+    if (std::filesystem::create_directory(directory))
+        setenv("PATH", (directory + ":" + getenv("PATH")).c_str(), 1);
+    return directory;
 }
 
 void set_tool_script(const std::string &script)
@@ -104,7 +104,7 @@ void set_tool_script(const std::string &script)
     commands.clear();
     refuse_pipes = false;
     for (const char *tool : {"/cat", "/iwlist"}) {
-        std::string path = tool_folder() + tool;
+        std::string path = tool_directory() + tool;
         write_file(path, "#!/bin/sh\n" + script + "\n");
         std::filesystem::permissions(path, std::filesystem::perms::owner_all);
     }

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Descriptors of the test itself, for those that must not leave one behind.
+// Counting the descriptors of the test itself, for functions that must not leave one open.
 
 #ifndef TESTS_CONNECTION_DESCRIPTORS_H
 #define TESTS_CONNECTION_DESCRIPTORS_H
@@ -11,11 +11,11 @@
 inline size_t open_descriptors()
 {
     size_t count = 0;
-    DIR *folder = opendir("/proc/self/fd");
+    DIR *directory = opendir("/proc/self/fd");
 
-    while (readdir(folder) != nullptr)
+    while (readdir(directory) != nullptr)
         count++;
-    closedir(folder);
+    closedir(directory);
     return count;
 }
 

@@ -8,10 +8,10 @@
 
 #include "commands.h"
 
-std::vector<golden> goldens(const std::string &folder, const std::string &suffix)
+std::vector<golden> goldens(const std::string &directory, const std::string &suffix)
 {
     std::vector<golden> found;
-    for (const auto &entry : std::filesystem::directory_iterator(GOLDENS "/" + folder)) {
+    for (const auto &entry : std::filesystem::directory_iterator(GOLDENS "/" + directory)) {
         std::filesystem::path path = entry.path();
         if (path.extension() == ".txt")
             found.push_back({path.stem(), path, read_file(path.replace_extension(suffix))});

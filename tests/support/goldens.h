@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The inputs of tests/goldens with the records that stand beside them.
+// The inputs of tests/goldens and the records expected from them.
 
 #ifndef TESTS_SUPPORT_GOLDENS_H
 #define TESTS_SUPPORT_GOLDENS_H
@@ -8,13 +8,13 @@
 #include <vector>
 
 struct golden {
-    std::string name, input, expected; // `input` is a path, `expected` a content
+    std::string name, input, expected; // `input` is a path, `expected` the text of the records
 };
 
-// Those of a folder ("scan"), whose records stand in files with a suffix (".cells").
-std::vector<golden> goldens(const std::string &folder, const std::string &suffix);
+// The goldens of a directory ("scan"); their records are in files with a suffix (".cells").
+std::vector<golden> goldens(const std::string &directory, const std::string &suffix);
 
-// "LABEL: VALUE\n" as the files of records have it.
+// A line "LABEL: VALUE\n" as in the files of records.
 std::string golden_line(const std::string &label, const std::string &value);
 
 #endif

@@ -26,7 +26,7 @@ std::vector<std::string> lines(const std::string &text, size_t size)
     return result;
 }
 
-// The length that a UTF-8 lead byte announces.
+// The length of a character by its UTF-8 lead byte.
 static size_t announced(unsigned char byte)
 {
     const struct {
@@ -54,11 +54,11 @@ std::string cut(const std::string &text, size_t size)
 
 std::string trim(const std::string &text)
 {
-    const char *blanks = " \t\n\f\r";
-    size_t from = text.find_first_not_of(blanks);
+    const char *white_space = " \t\n\f\r";
+    size_t from = text.find_first_not_of(white_space);
     if (from == std::string::npos)
         return "";
-    return text.substr(from, text.find_last_not_of(blanks) - from + 1);
+    return text.substr(from, text.find_last_not_of(white_space) - from + 1);
 }
 
 bool shell_words(const std::string &command, std::vector<std::string> *words, std::string *file)
@@ -128,10 +128,10 @@ std::vector<std::string> split(const std::string &text, const std::string &separ
 
 static std::vector<std::string> words(const std::string &text)
 {
-    const char *blanks = " \t\n\v\f\r";
+    const char *white_space = " \t\n\v\f\r";
     std::vector<std::string> result;
-    for (size_t at = 0; (at = text.find_first_not_of(blanks, at)) != std::string::npos;) {
-        size_t end = std::min(text.find_first_of(blanks, at), text.size());
+    for (size_t at = 0; (at = text.find_first_not_of(white_space, at)) != std::string::npos;) {
+        size_t end = std::min(text.find_first_of(white_space, at), text.size());
         result.push_back(text.substr(at, end - at));
         at = end;
     }
@@ -165,11 +165,11 @@ interfaces read_interfaces(const std::string &text)
     interfaces result = {-1, {}};
     if (header == all.end())
         return result;
-    std::vector<std::string> behind(header + 1, all.end());
-    result.count = static_cast<int>(std::min<size_t>(behind.size(), 16));
-    behind.push_back(all.back());
-    for (size_t i = 0; i < behind.size() && i < 16; i++)
-        result.names.push_back(cut(trim(split(behind[i], ":")[0]), 16));
+    std::vector<std::string> after(header + 1, all.end());
+    result.count = static_cast<int>(std::min<size_t>(after.size(), 16));
+    after.push_back(all.back());
+    for (size_t i = 0; i < after.size() && i < 16; i++)
+        result.names.push_back(cut(trim(split(after[i], ":")[0]), 16));
     return result;
 }
 
@@ -180,7 +180,7 @@ bool cell::operator==(const cell &other) const
            encmode == other.encmode;
 }
 
-// What a terminal may get: control characters as \xNN, those of two bytes too.
+// The text for a terminal: control characters as \xNN, also those of two bytes.
 static std::string shown(const std::string &text)
 {
     static const std::regex control("[\x01-\x1F\x7F]|\xC2[\x80-\x9F]");
@@ -208,7 +208,7 @@ std::vector<cell> read_cells(const std::string &text, std::string *printed)
     auto say = [&](const std::string &what) {
         log += "WIRELESS-LAN-DEBUG: " + shown(what) + "\n";
     };
-    auto behind = [](const std::string &line, const std::string &keyword) {
+    auto after = [](const std::string &line, const std::string &keyword) {
         size_t at = line.find(keyword);
         return at == std::string::npos ? "" : trim(line.substr(at + keyword.size()));
     };
@@ -222,13 +222,13 @@ std::vector<cell> read_cells(const std::string &text, std::string *printed)
         cell now = {};
         for (; at < all.size(); at++) {
             size_t i = 0;
-            while (i < 6 && (!values[i].empty() || behind(all[at], keywords[i]).empty()))
+            while (i < 6 && (!values[i].empty() || after(all[at], keywords[i]).empty()))
                 i++;
-            if (i == 6 && !behind(all[at], "Bit Rates:").empty())
+            if (i == 6 && !after(all[at], "Bit Rates:").empty())
                 break;
             if (i == 6)
                 continue;
-            values[i] = split(behind(all[at], keywords[i]), i == 1 ? "        " : " ")[0];
+            values[i] = split(after(all[at], keywords[i]), i == 1 ? "        " : " ")[0];
             if (i == 1) {
                 std::string name = values[1];
                 if (name.front() == '"')
@@ -275,8 +275,8 @@ std::vector<preferred> read_preferred(const std::string &text)
         for (size_t i = 0; i < 7 && at + 1 < all.size(); i++)
             line[i] = all[++at];
         auto rest = [](const std::string &from) {
-            size_t blank = from.find(' ');
-            return blank == std::string::npos ? "" : cut(trim(from.substr(blank)), 128);
+            size_t space = from.find(' ');
+            return space == std::string::npos ? "" : cut(trim(from.substr(space)), 128);
         };
         std::string word = second_word(line[5], 128);
         networks.push_back({rest(line[0]), rest(line[1]), second_word(line[2], 16),
@@ -349,7 +349,7 @@ static size_t stanza(const std::vector<std::string> &all, const std::string &nam
     return all.size();
 }
 
-// Calls `use` with the value of line `at` (behind the end: the last one) when it has one.
+// Calls `use` with the value of line `at` (past the end: of the last line), if it has one.
 static void value(const std::vector<std::string> &all, size_t at, const std::string &keyword,
                   const std::function<void(const std::string &)> &use)
 {

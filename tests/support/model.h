@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: MIT
-// What the readers should make of a text, worked out a second time: from whole lists of lines and
-// pieces of std::string instead of from a stream, so that the two agree only where both are right.
+// The expected results of the readers, computed in a second way: from lists of lines and from
+// pieces of std::string instead of a stream, so that both agree only when they are right.
 
 #ifndef TESTS_SUPPORT_MODEL_H
 #define TESTS_SUPPORT_MODEL_H
@@ -11,27 +11,27 @@
 namespace model
 {
 
-// The lines that fgets makes of a text with a buffer of `size` bytes, as C strings see them.
+// The lines of a text as fgets reads them into a buffer of `size` bytes, as C strings.
 std::vector<std::string> lines(const std::string &text, size_t size);
 
-// What a field of `size` bytes holds of a text.
+// The part of a text that a field of `size` bytes holds.
 std::string cut(const std::string &text, size_t size);
 
 std::string trim(const std::string &text);
 
-// The pieces between single separators; always one at least.
+// The pieces between separators; at least one.
 std::vector<std::string> split(const std::string &text, const std::string &separator);
 
-// The second of the words between white space, as a field of `size` bytes holds it.
+// The second word (words are separated by white space), as a field of `size` bytes holds it.
 std::string second_word(const std::string &text, size_t size);
 
-// The words of a simple command and the file behind ">", as a POSIX shell reads them; false for a
-// command that has anything else in it (an expansion, a second command, an open quote).
+// The words of a simple command and the file after ">", as a POSIX shell reads them. False for a
+// command with anything else in it: an expansion, a second command, an open quote.
 bool shell_words(const std::string &command, std::vector<std::string> *words, std::string *file);
 
 struct interfaces {
     int count;
-    std::vector<std::string> names; // of all the slots that are filled
+    std::vector<std::string> names; // of all filled slots
 };
 interfaces read_interfaces(const std::string &text);
 
@@ -40,7 +40,7 @@ struct cell {
     unsigned encmode;
     bool operator==(const cell &other) const;
 };
-// `printed` gets what goes to standard error, when it is given.
+// `printed`, if given, receives the text for standard error.
 std::vector<cell> read_cells(const std::string &text, std::string *printed = nullptr);
 
 struct preferred {
@@ -62,12 +62,12 @@ basic read_basic(const std::string &text, const std::string &name, basic before)
 basic read_basic_advanced(const std::string &text, const std::string &name, basic before);
 std::string write_basic(const std::string &name, const basic &settings);
 
-// The value, "" for none; `found` is false for NULL.
+// The value, or "" for none; `found` is false for NULL.
 std::string file_var(const std::string &text, const std::string &var, bool *found);
 
 } // namespace model
 
-// The records of my_wifi in the model's form.
+// The records of my_wifi in the form of the model.
 std::vector<model::cell> scanned_cells();
 std::vector<model::preferred> preferred_networks();
 model::basic basic_settings();

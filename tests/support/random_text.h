@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// Texts for generated records: empty ones, full ones, blanks, line ends, bytes that are no UTF-8.
+// Texts for generated records: empty, full, with spaces, with line ends, with bytes that are not
+// UTF-8.
 
 #ifndef TESTS_SUPPORT_RANDOM_TEXT_H
 #define TESTS_SUPPORT_RANDOM_TEXT_H
@@ -9,13 +10,13 @@
 
 #include <glib.h>
 
-// Numbers below `bound`, the same in every run.
+// Random numbers below `bound`, the same in every run.
 inline unsigned random_number(std::mt19937 &source, unsigned bound)
 {
     return static_cast<unsigned>(source() % bound);
 }
 
-// A text that a field of `size` bytes holds whole.
+// A text that fits in a field of `size` bytes.
 inline std::string random_text(std::mt19937 &source, unsigned size)
 {
     static const char *const kinds[] = {

@@ -8,17 +8,17 @@
 
 #include "wifi.h"
 
-// Makes my_wifi a new zeroed record with nothing selected and clears the static_ globals. Records
-// of the former one are freed.
+// Replaces my_wifi by a zeroed record with nothing selected, frees the old records and clears the
+// static_ globals.
 void fresh_state();
 
 // Adds the first interface record, named `name`.
 WIFI_INTERFACE *add_interface(const char *name);
 
-// Adds a zeroed preferred network behind the last one.
+// Appends a zeroed preferred network.
 WIFI_CELL *add_preferred();
 
-// A field's text; aborts when it has no terminator.
+// The text of a field; aborts when it has no terminator.
 std::string field_text(const char *field, gsize size);
 
 #define FIELD(record, name) field_text((record).name, sizeof(record).name)

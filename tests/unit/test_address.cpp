@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// What counts as an IPv4 address in the settings dialog.
+// Which texts the settings dialog accepts as IPv4 addresses.
 
 #include <cerrno>
 #include <cstring>
@@ -11,7 +11,7 @@
 
 static const std::string REASON = std::string("inet_pton: ") + strerror(EINVAL) + "\n";
 
-// The judgement together with what goes to standard error.
+// The result and the text on standard error.
 static void expect_judgement(const char *text, gboolean valid)
 {
     testing::internal::CaptureStderr();
@@ -94,7 +94,7 @@ TEST(Address, Null)
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
 }
 
-// An earlier error must not be the reason that is printed.
+// The reason printed must not be that of an earlier error.
 TEST(Address, ReasonIsItsOwn)
 {
     errno = ENOENT;

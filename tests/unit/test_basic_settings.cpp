@@ -34,7 +34,7 @@ static const char DHCP_STANZA[] = "iface wlan0\n"
                                   "MODE Ad-Hoc\n"
                                   "KEY \n"
                                   "Encryption off\n";
-// Both flags zero: the writer calls it static and goes on as for DHCP.
+// With both flags zero the writer says static and continues as for DHCP.
 static const char NEITHER_STANZA[] = "iface wlan0\n"
                                      "addrtype static\n"
                                      "dns manual\n"
@@ -47,7 +47,7 @@ static const char NEITHER_STANZA[] = "iface wlan0\n"
 class BasicSettings : public testing::Test
 {
 protected:
-    std::string file = scratch_folder() + "/wireless.conf";
+    std::string file = scratch_directory() + "/wireless.conf";
     WIFI_INTERFACE *iface = nullptr;
 
     void SetUp() override
@@ -56,7 +56,7 @@ protected:
         iface = add_interface("wlan0");
         remove(file.c_str());
     }
-    // What saving and reading print on the two streams.
+    // What saving and reading print on standard output and standard error.
     std::string errors, output;
     gboolean whole = FALSE; // what the last reading returned
 
@@ -175,12 +175,12 @@ TEST_F(BasicSettings, WritesNoLineOfAValuesOwn)
 
 TEST_F(BasicSettings, SaysWhyAFileCannotBeWritten)
 {
-    file = scratch_folder() + "/missing/wireless.conf";
+    file = scratch_directory() + "/missing/wireless.conf";
     EXPECT_FALSE(save());
     EXPECT_EQ(errors, "WIRELESS-LAN-DEBUG: File " + file +
                           " cannot be open.\nWIRELESS-LAN-DEBUG: " + file +
                           ": No such file or directory\n");
-    file = scratch_folder();
+    file = scratch_directory();
     EXPECT_FALSE(save());
     EXPECT_EQ(errors, "WIRELESS-LAN-DEBUG: File " + file +
                           " cannot be open.\nWIRELESS-LAN-DEBUG: " + file + ": Is a directory\n");
@@ -222,7 +222,7 @@ TEST_F(BasicSettings, ReadsADhcpStanza)
     EXPECT_EQ(output, "buffer=wifigroup 0\r\n");
 }
 
-// The words of an ESSID or a key come back as the first one.
+// Of an ESSID or a key with several words only the first one is read back.
 TEST_F(BasicSettings, DisagreeOnBlanksInNameAndKey)
 {
     read(STATIC_STANZA);
@@ -257,8 +257,8 @@ TEST_F(BasicSettings, ADhcpStanzaLeavesTheAddresses)
     EXPECT_STREQ(static_gateway, "192.168.1.1");
 }
 
-// The four address lines swallow those of the group; only the last line, met again past the end of
-// the file, still counts.
+// The four lines that are read as addresses are those of the group. Only the last line, read again
+// at the end of the file, still counts.
 TEST_F(BasicSettings, AStanzaWithBothFlagsZeroMeetsTheWrongLines)
 {
     set_addresses();
@@ -419,15 +419,15 @@ TEST_F(BasicSettings, WithoutAStanzaEmptyTheGroupAlone)
 
 TEST_F(BasicSettings, AMissingFileOrAFolderChangesNothing)
 {
-    for (const std::string &path : {scratch_folder() + "/missing", scratch_folder()}) {
+    for (const std::string &path : {scratch_directory() + "/missing", scratch_directory()}) {
         iface->wifi_group_enable = TRUE;
         set_group("e", "k", ENC_OPEN);
         file = path;
         for (auto reader : {get_basic_setting_from_file, get_basic_setting_from_file_Advanced}) {
             capture(reader);
             EXPECT_EQ(errors, "Could not access file: " + path + "\n");
-            // Only a file that does not exist is an empty one.
-            EXPECT_EQ(whole, path != scratch_folder());
+            // Only a missing file counts as an empty one.
+            EXPECT_EQ(whole, path != scratch_directory());
         }
         EXPECT_EQ(iface->wifi_group_enable, 1);
         EXPECT_STREQ(iface->wifi_group.essid, "e");
@@ -457,7 +457,7 @@ TEST_F(BasicSettings, CutLongValuesToTheirFields)
     EXPECT_EQ(iface->wifi_group.encmode, ENC_OPEN);
 }
 
-// A line of 254 bytes and its line end takes two reads.
+// A line of 254 bytes and its newline take two reads.
 TEST_F(BasicSettings, TakeTheRestOfALongLineAsALine)
 {
     std::string name = "ESSID " + std::string(248, 'e');
@@ -475,7 +475,7 @@ TEST_F(BasicSettings, TakeANulByteAsTheEndOfItsLine)
     EXPECT_STREQ(static_address, "1");
 }
 
-// The stream stays open, one and the same from call to call and close-on-exec.
+// One stream stays open across calls, close-on-exec.
 TEST_F(BasicSettings, LeaveOneStreamOpen)
 {
     read(DHCP_STANZA);
@@ -503,7 +503,7 @@ TEST_F(BasicSettings, LeaveOneStreamOpen)
 
 TEST_F(BasicSettings, ComeBackAsAnIndependentReadingHasThem)
 {
-    file = memory_folder() + "/wireless.conf";
+    file = memory_directory() + "/wireless.conf";
     std::mt19937 source(20240601);
     for (int round = 0; round < 3000; round++) {
         fresh_state();
@@ -613,7 +613,7 @@ TEST_F(BasicSettings, FileVarCutsTheFileInto2048Lines)
         lines += "x\n";
     write_file(file, lines + "MODE=1\nlast=2\n");
     g_autofree gchar *rest = get_file_var(file.c_str(), "MODE");
-    EXPECT_STREQ(rest, "2"); // what is left is one line
+    EXPECT_STREQ(rest, "2"); // the rest is one line
     write_file(file, lines.substr(2) + "MODE=1\nlast=2\n");
     g_autofree gchar *line = get_file_var(file.c_str(), "MODE");
     EXPECT_STREQ(line, "1");
@@ -621,7 +621,7 @@ TEST_F(BasicSettings, FileVarCutsTheFileInto2048Lines)
 
 TEST_F(BasicSettings, FileVarSaysThatAFileCannotBeRead)
 {
-    for (const std::string &path : {scratch_folder() + "/missing", scratch_folder()}) {
+    for (const std::string &path : {scratch_directory() + "/missing", scratch_directory()}) {
         testing::internal::CaptureStderr();
         EXPECT_EQ(get_file_var(path.c_str(), "MODE"), nullptr);
         EXPECT_EQ(testing::internal::GetCapturedStderr(), "Could not access file: " + path + ".\n");

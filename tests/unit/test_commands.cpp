@@ -142,19 +142,19 @@ extern "C" int mknod(const char *path, mode_t mode, dev_t device)
 }
 
 struct LeaveText : testing::Test {
-    std::string folder, path;
+    std::string directory, path;
 
     void SetUp() override
     {
         char name[] = "/tmp/leave-text.XXXXXX";
 
-        folder = mkdtemp(name);
-        path = folder + "/key_tmp";
+        directory = mkdtemp(name);
+        path = directory + "/key_tmp";
     }
 
     void TearDown() override
     {
-        g_autofree gchar *command = g_strdup_printf("rm -rf %s", folder.c_str());
+        g_autofree gchar *command = g_strdup_printf("rm -rf %s", directory.c_str());
 
         run_command(command);
     }
@@ -193,7 +193,7 @@ TEST_F(LeaveText, ReplacesAFileThatOthersCouldRead)
 
 TEST_F(LeaveText, DoesNotFollowALink)
 {
-    const std::string target = folder + "/target";
+    const std::string target = directory + "/target";
 
     ASSERT_TRUE(g_file_set_contents(target.c_str(), "untouched", -1, nullptr));
     ASSERT_EQ(symlink(target.c_str(), path.c_str()), 0);
@@ -205,7 +205,7 @@ TEST_F(LeaveText, DoesNotFollowALink)
 
 TEST_F(LeaveText, DoesNotFollowALinkToNowhere)
 {
-    const std::string target = folder + "/nowhere";
+    const std::string target = directory + "/nowhere";
 
     ASSERT_EQ(symlink(target.c_str(), path.c_str()), 0);
     leave_text_for_scripts("secret", path.c_str(), 0600);

@@ -15,8 +15,8 @@ static const char HEADER[] = "Inter-| sta-|\n face | tus | link\n";
 
 static void set_list(const std::string &list)
 {
-    write_file(scratch_folder() + "/list", list);
-    set_tool_output(scratch_folder() + "/list");
+    write_file(scratch_directory() + "/list", list);
+    set_tool_output(scratch_directory() + "/list");
 }
 
 TEST(GetInterface, AgreesWithEveryGolden)
@@ -48,7 +48,7 @@ TEST(GetInterface, AllocatesAFirstRecordForAListWithoutInterfaces)
     EXPECT_EQ(my_wifi->wifi_interface[1], nullptr);
 }
 
-TEST(GetInterface, FillsTheSlotBehindTheLastInterface)
+TEST(GetInterface, FillsTheSlotAfterTheLastInterface)
 {
     fresh_state();
     set_list(std::string(HEADER) + " wlan0: 0\n");

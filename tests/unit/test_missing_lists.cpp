@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The key dialog's combos before the preferred lists exist; no display is needed to say no.
+// The combos of the key dialog before the preferred lists exist. This needs no display.
 
 #include <string>
 

@@ -12,10 +12,10 @@
 #include "support/descriptors.h"
 #include "wifi.h"
 
-// What the kernel's list holds; NULL: it cannot be opened.
+// The content of the kernel's list; NULL: it cannot be opened.
 static const std::string *list = nullptr;
 
-// In place of the C library's: the program opens nothing else here.
+// Replaces fopen of the C library; the program opens nothing else here.
 extern "C" FILE *fopen(const char *path, const char *mode)
 {
     if (strcmp(path, "/proc/net/wireless") != 0) {
@@ -95,7 +95,7 @@ TEST(NetworkStatics, StopsWhereTheLineEnds)
               "WIRELESS-LAN-DEBUG: link quality--->7\nWIRELESS-LAN-DEBUG: level=0\n");
 }
 
-// Whatever stands in the list, at most the five lines come out and no descriptor stays.
+// Whatever the list contains, at most five lines are printed and no descriptor stays open.
 TEST(NetworkStatics, SurvivesDamagedLists)
 {
     const std::string sound =

@@ -16,7 +16,7 @@ using namespace std::string_literals;
 class PreferredFile : public testing::Test
 {
 protected:
-    std::string file = scratch_folder() + "/wireless-user.conf";
+    std::string file = scratch_directory() + "/wireless-user.conf";
     std::string errors;
     gboolean read_whole = FALSE; // what the last reading returned
 
@@ -95,10 +95,10 @@ TEST_F(PreferredFile, HasNoLineOfAValuesOwn)
 
 TEST_F(PreferredFile, KeepsTheOldOneWhenItCannotBeWritten)
 {
-    file = scratch_folder() + "/missing/wireless-user.conf";
+    file = scratch_directory() + "/missing/wireless-user.conf";
     EXPECT_FALSE(save());
     EXPECT_EQ(errors, "WIRELESS-LAN-DEBUG: " + file + ": No such file or directory\n");
-    file = scratch_folder();
+    file = scratch_directory();
     EXPECT_FALSE(save());
     EXPECT_EQ(errors, "WIRELESS-LAN-DEBUG: " + file + ": Is a directory\n");
 }
@@ -215,7 +215,8 @@ TEST_F(PreferredFile, NumbersByOrder)
     EXPECT_STREQ(my_wifi->user_wifi_cell[2]->alias, "x");
 }
 
-// A file cut after any byte yields every record that it begins; from the cut on a record is zero.
+// A file that is cut after any byte yields every record that has begun; the fields after the cut
+// are zero.
 TEST_F(PreferredFile, CutAnywhereYieldsWhatIsThere)
 {
     add("alias one", "essid one", ENC_RESTRICTED, "key1");
@@ -249,7 +250,7 @@ TEST_F(PreferredFile, KeepsAFullAlias)
     EXPECT_STREQ(my_wifi->user_wifi_cell[0]->essid, "far");
 }
 
-// A line of 254 bytes and its line end takes two reads.
+// A line of 254 bytes and its newline take two reads.
 TEST_F(PreferredFile, TakesTheRestOfALongLineAsALine)
 {
     read("USERCELL\nALIAS " + std::string(247, 'a') + "\nESSID e\n");
@@ -279,12 +280,12 @@ TEST_F(PreferredFile, StopsAt64Networks)
 TEST_F(PreferredFile, MissingOrAFolderChangesNothing)
 {
     add("before", "b", ENC_OFF, "");
-    for (const std::string &path : {scratch_folder() + "/missing", scratch_folder()}) {
+    for (const std::string &path : {scratch_directory() + "/missing", scratch_directory()}) {
         file = path;
         read();
         EXPECT_EQ(errors, "Could not access file: " + path + "\n");
-        // Only a file that does not exist is an empty one.
-        EXPECT_EQ(read_whole, path != scratch_folder());
+        // Only a missing file counts as an empty one.
+        EXPECT_EQ(read_whole, path != scratch_directory());
         EXPECT_EQ(my_wifi->user_cell_count, 1);
         EXPECT_STREQ(my_wifi->user_wifi_cell[0]->alias, "before");
     }
@@ -314,7 +315,7 @@ TEST_F(PreferredFile, TakesCarriageReturnsAndNulBytes)
 
 TEST_F(PreferredFile, ComesBackAsAnIndependentReadingHasIt)
 {
-    file = memory_folder() + "/wireless-user.conf";
+    file = memory_directory() + "/wireless-user.conf";
     std::mt19937 source(19991231);
     int networks = 0;
     for (int round = 0; round < 300; round++) {

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: MIT
-// A random user works the preferred networks through the program's own callbacks and dialogs, and a
-// simple model of the list says after every step what rows, selection, records and file must be.
-// SEQUENCES and SEED in the environment say how many sequences run and which is the first.
+// A random user operates the preferred networks through the program's own callbacks and dialogs.
+// After every step a simple model of the list predicts rows, selection, records and file. SEQUENCES
+// and SEED in the environment give the number of sequences and the first one.
 
 #include <cstdarg>
 #include <cstdio>
@@ -45,7 +45,7 @@ static std::vector<network> saved; // what the records must hold
 static string file_text;           // what the file must hold
 static string written;             // what the program wrote to it
 static int selected;
-static gboolean file_fails; // the next save cannot be written
+static gboolean file_fails; // the next save fails
 
 // --- complaints ---------------------------------------------------------------------------------
 
@@ -70,7 +70,7 @@ static void note(const char *format, ...)
 {
     fprintf(report, "%s is \"%s\", must be \"%s\"\nafter, with seed %u:%s\n", what, is.c_str(),
             wanted.c_str(), sequence_seed, history.c_str());
-    // A dialog may be open: there is no way back from here.
+    // A dialog may be open, so the test cannot continue.
     exit(EXIT_FAILURE);
 }
 
@@ -264,11 +264,11 @@ static void check_saved()
 
 static std::function<void()> next;
 
-// What the user does as soon as the program waits again, in whatever dialog that is.
+// What the user does once the program waits again, in whichever dialog that is.
 static void then(std::function<void()> action)
 {
     next = std::move(action);
-    // Most users are too quick for the dialogs to be drawn, which takes most of the time.
+    // Most users act before a dialog is drawn, because drawing takes most of the time.
     g_idle_add_full(
         one_in(10) ? G_PRIORITY_DEFAULT_IDLE : G_PRIORITY_HIGH_IDLE,
         [](gpointer) -> gboolean {
@@ -441,14 +441,14 @@ static void touch_form()
     check_form();
 }
 
-// The text of an entry, or the column's own bytes when the entry still shows those.
+// The text of an entry, or the bytes of the column if the entry still shows them.
 static void model_store(string &column, const string &text)
 {
     if (text != valid(column))
         column = text;
 }
 
-// What pressing OK leaves in the model, and the warning that it must bring (NULL: none).
+// The effect of OK on the model, and the message that it must show (NULL: none).
 static const char *model_form_ok()
 {
     const gboolean editing = names == &edit_names;
@@ -475,7 +475,7 @@ static const char *model_form_ok()
     return nullptr;
 }
 
-// The name that the front list shows is written only with an ESSID.
+// The text of the front list is updated only when there is an ESSID.
 static void check_refused(const char *warning, const string &before)
 {
     if (names == &edit_names && string(warning) == "Please enter the ESSID.") {
@@ -487,7 +487,7 @@ static void check_refused(const char *warning, const string &before)
     }
 }
 
-// A refused attempt without an ESSID leaves the front list as it was until the next good one.
+// After a refused attempt without an ESSID the front list is unchanged until the next accepted one.
 static gboolean front_stale;
 static string stale_text;
 
@@ -561,8 +561,8 @@ static void edit()
     press("preferred_button_properties");
     if (!front_stale)
         return;
-    // The rest of this test compares names; here the row is left as the user left it, with the
-    // former name still shown.
+    // The rest of the test compares names, but here the row keeps what the user left, with the old
+    // name shown.
     expect("the shown name", cell(FRONT_KEY, static_cast<size_t>(selected), 0), stale_text);
     gtk_clist_set_text(GTK_CLIST(find_widget(FRONT_KEY)), selected, 0,
                        shown(rows[static_cast<size_t>(selected)]).c_str());
@@ -677,7 +677,8 @@ static void use_list()
     answer(GTK_RESPONSE_OK);
 }
 
-// Between two openings: a network from outside joins, as when its key was kept after connecting.
+// Between two openings a network is added from outside, like one whose key is kept after
+// connecting.
 static void keep_network()
 {
     const network one = {some_text(TRUE), "kept", "Managed", "ENC_OPEN", "k", "1", "0"};
@@ -763,7 +764,7 @@ static void run_sequence()
     }
 }
 
-static int living = 0; // widgets that were seen and are not finalized
+static int living = 0; // widgets seen and not finalized yet
 
 static void count_finalized(gpointer, GObject *)
 {
@@ -778,8 +779,8 @@ static void count_living(GtkWidget *widget, gpointer)
         gtk_container_forall(GTK_CONTAINER(widget), count_living, nullptr);
 }
 
-// No opening of the list leaves a widget behind. Other memory is watched by the leak sanitizer;
-// what malloc has in use says little, as GTK+ itself keeps some bytes of every dialog.
+// Opening the list leaves no widget behind. The leak sanitizer watches other memory; the heap in
+// use says little, because GTK+ keeps some bytes for every dialog.
 static void check_growth()
 {
     for (int i = 0; i < 1000; i++) {
@@ -799,7 +800,7 @@ static void check_growth()
     }
 }
 
-// Stand in for the program's own: the file is a text.
+// Replace the program's functions: the file is a text.
 gboolean replace_file(const char *path, const char *content, gsize length, GError **error)
 {
     expect("the file's name", path, USER_FILE);
@@ -811,7 +812,7 @@ gboolean replace_file(const char *path, const char *content, gsize length, GErro
     return TRUE;
 }
 
-// No file here is one that could not be read whole.
+// No file in this test is one that could not be read whole.
 gboolean keep_old_file(const char *path, GError **)
 {
     fail("the file to keep", path, "none");

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// Kills, full disks, mounts and foreign owners: tests/save/.
+// tests/save/ covers kills, full disks, mounts and foreign owners.
 
 #include <gtest/gtest.h>
 
@@ -17,16 +17,16 @@ namespace fs = std::filesystem;
 class ReplaceFile : public testing::Test
 {
 protected:
-    std::string folder = scratch_folder() + "/replace", file = folder + "/conf";
+    std::string directory = scratch_directory() + "/replace", file = directory + "/conf";
     std::string cause; // of a failure
 
     void SetUp() override
     {
-        fs::create_directory(folder);
+        fs::create_directory(directory);
     }
     void TearDown() override
     {
-        fs::remove_all(folder);
+        fs::remove_all(directory);
     }
     gboolean replace(const std::string &path, const std::string &content)
     {
@@ -44,7 +44,7 @@ protected:
     }
     long entries()
     {
-        return std::distance(fs::directory_iterator(folder), fs::directory_iterator());
+        return std::distance(fs::directory_iterator(directory), fs::directory_iterator());
     }
 };
 
@@ -84,19 +84,19 @@ TEST_F(ReplaceFile, KeepsTheMode)
 
 TEST_F(ReplaceFile, FollowsLinks)
 {
-    fs::create_directory(folder + "/real");
-    write_file(folder + "/real/target", "old");
-    fs::create_symlink("real/target", folder + "/relative");
-    fs::create_symlink(folder + "/real/target", folder + "/absolute");
-    fs::create_symlink("relative", folder + "/twice");
-    fs::create_directory_symlink("real", folder + "/by-folder");
-    for (const char *name : {"/relative", "/absolute", "/twice", "/by-folder/target"}) {
-        EXPECT_TRUE(replace(folder + name, name));
-        EXPECT_EQ(read_file(folder + "/real/target"), name);
+    fs::create_directory(directory + "/real");
+    write_file(directory + "/real/target", "old");
+    fs::create_symlink("real/target", directory + "/relative");
+    fs::create_symlink(directory + "/real/target", directory + "/absolute");
+    fs::create_symlink("relative", directory + "/twice");
+    fs::create_directory_symlink("real", directory + "/by-directory");
+    for (const char *name : {"/relative", "/absolute", "/twice", "/by-directory/target"}) {
+        EXPECT_TRUE(replace(directory + name, name));
+        EXPECT_EQ(read_file(directory + "/real/target"), name);
     }
-    EXPECT_TRUE(fs::is_symlink(folder + "/relative"));
-    EXPECT_TRUE(fs::is_symlink(folder + "/absolute"));
-    EXPECT_TRUE(fs::is_symlink(folder + "/twice"));
+    EXPECT_TRUE(fs::is_symlink(directory + "/relative"));
+    EXPECT_TRUE(fs::is_symlink(directory + "/absolute"));
+    EXPECT_TRUE(fs::is_symlink(directory + "/twice"));
     EXPECT_EQ(entries(), 5);
 }
 
@@ -105,13 +105,13 @@ TEST_F(ReplaceFile, MakesTheFileThatALinkLeadsTo)
     fs::create_symlink("later", file);
     EXPECT_TRUE(replace(file, "content"));
     EXPECT_TRUE(fs::is_symlink(file));
-    EXPECT_EQ(read_file(folder + "/later"), "content");
-    EXPECT_EQ(mode_of(folder + "/later"), 0600u);
+    EXPECT_EQ(read_file(directory + "/later"), "content");
+    EXPECT_EQ(mode_of(directory + "/later"), 0600u);
 }
 
 TEST_F(ReplaceFile, FailsOnLinksInACircle)
 {
-    fs::create_symlink("conf", folder + "/other");
+    fs::create_symlink("conf", directory + "/other");
     fs::create_symlink("other", file);
     EXPECT_FALSE(replace(file, "content"));
     EXPECT_EQ(cause, file + ": Too many levels of symbolic links");
@@ -121,14 +121,14 @@ TEST_F(ReplaceFile, FailsOnLinksInACircle)
 
 TEST_F(ReplaceFile, SaysWhyItFails)
 {
-    EXPECT_FALSE(replace(folder, "content"));
-    EXPECT_EQ(cause, folder + ": Is a directory");
-    EXPECT_FALSE(replace(folder + "/missing/conf", "content"));
-    EXPECT_EQ(cause, folder + "/missing/conf: No such file or directory");
+    EXPECT_FALSE(replace(directory, "content"));
+    EXPECT_EQ(cause, directory + ": Is a directory");
+    EXPECT_FALSE(replace(directory + "/missing/conf", "content"));
+    EXPECT_EQ(cause, directory + "/missing/conf: No such file or directory");
     write_file(file, "old");
     EXPECT_FALSE(replace(file + "/conf", "content"));
     EXPECT_EQ(cause, file + "/conf: Not a directory");
-    std::string longest = folder + "/" + std::string(300, 'n');
+    std::string longest = directory + "/" + std::string(300, 'n');
     EXPECT_FALSE(replace(longest, "content"));
     EXPECT_EQ(cause, longest + ": File name too long");
     EXPECT_EQ(entries(), 1);
@@ -137,10 +137,10 @@ TEST_F(ReplaceFile, SaysWhyItFails)
 TEST_F(ReplaceFile, TellsWhetherAFileCouldBeOpened)
 {
     g_autoptr(GError) error = nullptr;
-    EXPECT_FALSE(replace_file((folder + "/missing/conf").c_str(), "", 0, &error));
+    EXPECT_FALSE(replace_file((directory + "/missing/conf").c_str(), "", 0, &error));
     EXPECT_TRUE(g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED));
     g_clear_error(&error);
-    EXPECT_FALSE(replace_file(folder.c_str(), "", 0, &error));
+    EXPECT_FALSE(replace_file(directory.c_str(), "", 0, &error));
     EXPECT_TRUE(g_error_matches(error, REPLACE_ERROR, REPLACE_NOT_OPENED));
 }
 
@@ -162,19 +162,19 @@ TEST_F(ReplaceFile, KeepsTheOldOneBesideIt)
 
 TEST_F(ReplaceFile, KeepsItWhereALinkLeads)
 {
-    fs::create_directory(folder + "/real");
-    write_file(folder + "/real/target", "old");
+    fs::create_directory(directory + "/real");
+    write_file(directory + "/real/target", "old");
     fs::create_symlink("real/target", file);
     EXPECT_TRUE(keep_old_file(file.c_str(), nullptr));
-    EXPECT_EQ(read_file(folder + "/real/target.old"), "old");
+    EXPECT_EQ(read_file(directory + "/real/target.old"), "old");
     EXPECT_EQ(entries(), 2);
 }
 
 TEST_F(ReplaceFile, SaysWhyNothingIsKept)
 {
     g_autoptr(GError) error = nullptr;
-    EXPECT_FALSE(keep_old_file(folder.c_str(), &error));
-    EXPECT_EQ(error->message, folder + ": Is a directory");
+    EXPECT_FALSE(keep_old_file(directory.c_str(), &error));
+    EXPECT_EQ(error->message, directory + ": Is a directory");
     g_clear_error(&error);
     write_file(file, "old");
     fs::create_directory(file + ".old");
@@ -188,7 +188,7 @@ TEST_F(ReplaceFile, LeavesADeviceADevice)
     fs::create_symlink("/dev/null", file);
     EXPECT_FALSE(replace(file, "content"));
     EXPECT_TRUE(fs::is_character_file("/dev/null"));
-    std::string pipe = folder + "/pipe";
+    std::string pipe = directory + "/pipe";
     ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
     EXPECT_FALSE(replace(pipe, "content"));
     EXPECT_TRUE(fs::is_fifo(pipe));
@@ -198,7 +198,7 @@ TEST_F(ReplaceFile, LeavesNoDescriptorOpen)
 {
     std::vector<std::string> before = open_descriptors();
     replace(file, "content");
-    replace(folder, "content");
-    replace(folder + "/missing/conf", "content");
+    replace(directory, "content");
+    replace(directory + "/missing/conf", "content");
     EXPECT_EQ(open_descriptors(), before);
 }

@@ -20,11 +20,11 @@ static const char NETWORK[] = "          Cell 01 - Address: 00:11:22:33:44:55\n"
 
 static void set_scan(const std::string &output)
 {
-    write_file(scratch_folder() + "/scan", output);
-    set_tool_output(scratch_folder() + "/scan");
+    write_file(scratch_directory() + "/scan", output);
+    set_tool_output(scratch_directory() + "/scan");
 }
 
-// Scans on a new state and returns what went to standard error.
+// Scans with a new state and returns the text on standard error.
 static std::string scan()
 {
     fresh_state();
@@ -192,7 +192,7 @@ TEST(GetCell, IgnoresHowTheToolEnds)
     EXPECT_EQ(my_wifi->cell_count, 0);
 }
 
-// The tool goes on for ever; the scan ends with the 129th network.
+// The tool never stops printing; the scan ends at the 129th network.
 TEST(GetCell, StopsAtTheEndOfThe129thNetwork)
 {
     set_tool_script("while echo 'Cell - Address: A' && echo 'Bit Rates:1'; do :; done 2>/dev/null");

@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: MIT
-// The dialogs of the settings from inside the program: what no hand at the device can bring about
-// or see.
+// The settings dialogs from inside the program: what a user at the device cannot cause or see.
 
 #include <gtest/gtest.h>
 #include <gtk/gtk.h>
@@ -28,7 +27,7 @@ static GtkDialog *open_dialog()
     return found;
 }
 
-// Two interfaces, DHCP, a main window with nothing in it.
+// Two interfaces, DHCP, an empty main window.
 static void start()
 {
     ASSERT_TRUE(gtk_init_check(nullptr, nullptr)) << "no display";
@@ -46,7 +45,7 @@ static void start()
     }
 }
 
-// Opens the dialog, calls `steps` under it, and cancels it if there still is a main window.
+// Opens the dialog, calls `steps` while it runs, and cancels it if the main window still exists.
 static void run_dialog(void (*steps)(GtkDialog *))
 {
     under_dialog = steps;
@@ -95,7 +94,7 @@ static const char *entry_text(const char *key)
 static guint born;
 static guint alive;
 
-// Counts `object` until it is finalized, which destroying it is not.
+// Counts `object` until it is finalized; destroying it is not enough.
 static void count(gpointer object)
 {
     born++;
@@ -150,7 +149,7 @@ TEST(SettingsDialog, ChoosesOnTheSelectedInterface)
     expect_flags(1, TRUE, FALSE);
 }
 
-// Another selection, a slot that never held an interface, indexes beyond the table.
+// Another selected interface, a slot without one, indexes out of range.
 TEST(SettingsDialog, AnotherSelectionMissesTheWidgets)
 {
     for (int index : {1, 7, -1, MAX_INTERFACES, G_MAXINT, G_MININT}) {
@@ -204,7 +203,7 @@ TEST(SettingsDialog, GoesWithTheMainWindow)
     EXPECT_EQ(mainwindow, nullptr);
 }
 
-// Nobody could answer the dialog if it ran again.
+// If the dialog ran again nobody could answer it.
 TEST(SettingsDialog, GoesWithTheMainWindowUnderARefusal)
 {
     start();
@@ -232,7 +231,7 @@ TEST(SettingsDialog, GoesWithTheMainWindowUnderARefusal)
     EXPECT_EQ(open_dialog(), nullptr);
 }
 
-// The answer OK for a group that is shown as it is.
+// Answers OK with the group as it is shown.
 static void accept_group(WIFI_CELL *group)
 {
     g_idle_add(
@@ -253,7 +252,7 @@ TEST(GroupDialog, Stores)
     } rows[] = {{ENC_OFF, ENC_OFF},
                 {ENC_OPEN, ENC_OPEN},
                 {ENC_RESTRICTED, ENC_RESTRICTED},
-                {3, ENC_OFF}, // no radio button stands for it, so the first one is on
+                {3, ENC_OFF}, // it has no radio button, so the first one is active
                 {G_MAXUINT32, ENC_OFF}};
 
     start();
@@ -262,7 +261,7 @@ TEST(GroupDialog, Stores)
 
         copy_field(group.essid, sizeof group.essid, "board \xff");
         copy_field(group.userkey, sizeof group.userkey, "key \xfe");
-        copy_field(group.mode, sizeof group.mode, "Ad-Hos"); // as the file's reader leaves it
+        copy_field(group.mode, sizeof group.mode, "Ad-Hos"); // as the reader of the file sets it
         group.encmode = static_cast<t_encmode>(row.encmode);
         accept_group(&group);
         EXPECT_STREQ(group.essid, "board \xff");
@@ -282,15 +281,15 @@ static gboolean cb_count(GSignalInvocationHint *, guint, const GValue *values, g
     return TRUE;
 }
 
-// Nobody owns the key entry and the radio buttons but the dialog's handler.
-TEST(GroupDialog, LeavesNoWidgetBehind)
+// Only the dialog's handler owns the key entry and the radio buttons.
+TEST(GroupDialog, LeavesNoWidget)
 {
     WIFI_CELL group = {};
 
     start();
     copy_field(group.essid, sizeof group.essid, "board");
     copy_field(group.userkey, sizeof group.userkey, "secret");
-    accept_group(&group); // the signals exist from here on
+    accept_group(&group); // from here on the signals exist
     born = 0;
 
     const guint packed = g_signal_lookup("parent-set", GTK_TYPE_WIDGET);

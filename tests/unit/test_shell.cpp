@@ -48,11 +48,11 @@ TEST(EchoCommand, IsNeverCut)
     EXPECT_EQ(strlen(command), strlen("echo \"\" >/tmp/x") + 200000);
 }
 
-// Every shell that is there writes the text and a line end.
+// Every installed shell writes the text and a newline.
 TEST(EchoCommand, WritesTheTextInRealShells)
 {
     int shells = 0;
-    std::string script = scratch_folder() + "/script", target = scratch_folder() + "/written";
+    std::string script = scratch_directory() + "/script", target = scratch_directory() + "/written";
     for (const char *shell : {"dash", "bash", "busybox sh", "zsh", "ksh"}) {
         if (real_system(std::string("command -v ") + shell + " >/dev/null 2>&1") != 0)
             continue;
@@ -70,7 +70,7 @@ TEST(EchoCommand, WritesTheTextInRealShells)
 
 TEST(ShellEscape, MakesOneArgumentInRealShells)
 {
-    std::string target = scratch_folder() + "/written";
+    std::string target = scratch_directory() + "/written";
     for (const char *text : HOSTILE) {
         g_autofree gchar *escaped = shell_escape(text);
         std::string command = std::string("printf '%s|' \"") + escaped + "\" >" + target;

@@ -55,7 +55,7 @@ TEST(CopyField, TakesATextInsideTheField)
     EXPECT_STREQ(field, "name ");
 }
 
-TEST(SecondWord, IsTheOneBehindTheFirst)
+TEST(SecondWord, IsTheOneAfterTheFirst)
 {
     const char *const cases[][2] = {
         {"KEY secret", "secret"},
@@ -144,7 +144,7 @@ TEST(Printable, ShowsControlCharactersAndLeavesTheRestByteForByte)
     }
 }
 
-TEST(WipeText, LeavesNoTextBehind)
+TEST(WipeText, LeavesNoText)
 {
     gchar *text = g_strdup("secret"), *none = nullptr;
     wipe_text(&text);
