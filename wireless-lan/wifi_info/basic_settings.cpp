@@ -30,7 +30,7 @@ static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 
     append_line(text, "iface", iface->name);
     if (iface->isstatic) {
-        append_line(text, "addrtype", "static "); // the blank is part of the format
+        append_line(text, "addrtype", "static "); // the space is part of the format
         for (const auto &address : ADDRESSES)
             append_line(text, address.keyword, address.value);
     } else {

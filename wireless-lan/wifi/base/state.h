@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// The variables that the modules of the window share. Only the GTK+ main thread uses them.
+// The variables that the modules of the window share. Only the GTK+ main
+// thread uses them. Each line ends with the files that write the variable.
 
 #ifndef WIFI_BASE_STATE_H
 #define WIFI_BASE_STATE_H
@@ -8,15 +9,15 @@
 
 #include "wifi.h"
 
-extern GtkWidget *mainwindow; // set by main; NULL before and after its life
-extern gint connect_index; // network the interface is with, -1: none; refresh, flow, chosen_network
-extern gint pid_dhclient;  // part of the state model, nothing sets it
-extern gboolean linkconnect;         // written by the link poller
+extern GtkWidget *mainwindow;        // NULL before it is created and after it is destroyed; main
+extern gint connect_index;           // the network joined, -1: none; refresh, flow, chosen_network
+extern gint pid_dhclient;            // part of the state model, nothing sets it
+extern gboolean linkconnect;         // an access point was found; monitor
 extern gboolean addressvalid;        // part of the state model, nothing sets it
-extern gboolean doubleclick;         // a double click may connect; written by flow and the pollers
-extern gint user_wifi_count;         // rows of the preferred lists; written by the preferred rooms
-extern GtkWidget *global_build_list; // the front list of start-up; written by start_up, store
-extern gint boxspacing;              // padding of the settings' address rows, pixels
+extern gboolean doubleclick;         // a double click connects; flow, monitor
+extern gint user_wifi_count;         // rows of the preferred lists; store
+extern GtkWidget *global_build_list; // the front list built at start-up; start_up, store
+extern gint boxspacing;              // around the address rows of the settings, in pixels; nobody
 
 // Creates the state record: zeroed, nothing selected. FALSE when there is no memory.
 gboolean my_wifi_init();
