@@ -18,7 +18,7 @@ COMMANDS = pytest.mark.parametrize("command, words", [
 @pytest.fixture(autouse=True)
 def every_command_succeeds():
     static()
-    joining.set_up("nmcli")
+    joining.set_up("nmcli", "iw")
 
 
 @pytest.fixture
@@ -98,6 +98,13 @@ def test_iwd(words, status):
     assert done[0] == status
     assert done[2] == (b"lnk-ifup: iwd holds wlan0: stop it, or start it with -I wlan0\n"
                        if status else b"")
+
+
+def test_iwd_does_not_keep_ours_on_the_interface():
+    begin("iwd")
+    assert run("lnk-ifdown", "wlan0")[0] == 0
+    assert [b"iw", b"dev", b"wlan0", b"disconnect"] in calls("iw")
+    assert not os.path.exists("/run/wireless-lan/reason")
 
 
 def test_hostapd():
