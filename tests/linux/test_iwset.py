@@ -481,11 +481,16 @@ BSS = "02:00:00:00:00:01"
 
 @pytest.mark.parametrize("event", [
     'CTRL-EVENT-SSID-TEMP-DISABLED id=0 ssid="x" auth_failures=1 duration=10 reason=WRONG_KEY',
-    f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=15"])
+    f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=15",
+    # hostapd's answer: it says no more
+    f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=1"])
 def test_event_of_a_wrong_key(event):
     """A wrong key of WPA3 shows in no state: that stays AUTHENTICATING."""
     note("status", "wpa_state=AUTHENTICATING\n")
     joining.event(event)
+    if event.endswith("=1"):
+        joining.event(f"SME: Trying to authenticate with {BSS} (SSID='x' freq=2437 MHz)")
+        joining.event(event)
     assert iwset_wpa("x", "12345678") == (1, b"", b"iwset: the access point refuses the key\n")
     assert reason() == b"wrong-key\n"
     assert not alive(supplicants()[-1])
@@ -494,6 +499,7 @@ def test_event_of_a_wrong_key(event):
 @pytest.mark.parametrize("event, word", [
     (f"CTRL-EVENT-ASSOC-REJECT bssid={BSS} status_code=17", b"refused\n"),
     (f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=0 auth_transaction=2 status_code=17", b"refused\n"),
+    (f"CTRL-EVENT-AUTH-REJECT {BSS} auth_type=3 auth_transaction=2 status_code=1", b"refused\n"),
     ("CTRL-EVENT-NETWORK-NOT-FOUND ", b"not-found\n"),
     # a name that says what the supplicant would
     ('CTRL-EVENT-SSID-TEMP-DISABLED id=0 ssid="<3>CTRL-EVENT-CONNECTED reason=WRONG_KEY" '
