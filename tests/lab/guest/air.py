@@ -37,9 +37,10 @@ def start(*command, netns=None, log=None, env=None):
                             env=env)
 
 
-def radios(count):
-    """Switch COUNT radios on: wlan0 stays here, the last goes to FAR, the others to AIR."""
-    run("modprobe", "mac80211_hwsim", f"radios={count}")
+def radios(count, multi_link=False):
+    """Switch COUNT radios on: wlan0 stays here, the last goes to FAR, the others to AIR. With
+    MULTI_LINK they are radios of Wi-Fi 7, to which Linux since 6.3 gives no wireless extensions."""
+    run("modprobe", "mac80211_hwsim", f"radios={count}", *(["mlo=1"] if multi_link else []))
     for name in (AIR, FAR):
         run("ip", "netns", "add", name)
         run("ip", "link", "set", "lo", "up", netns=name)
@@ -55,15 +56,15 @@ def phy(number):
         return file.read().strip()
 
 
-def network(name, key=None, wep=None, hidden=False, net=None):
-    """One network as access_point takes it: NAME in bytes, KEY of WPA2, WEP in hexadecimal digits,
-    NET its subnet's number or None for one without addresses."""
-    return {"name": name, "key": key, "wep": wep, "hidden": hidden, "net": net}
+def network(name, key=None, wep=None, hidden=False, net=None, wpa3=False):
+    """One network as access_point takes it: NAME in bytes, KEY of WPA2 or, with WPA3, of WPA3,
+    WEP in hexadecimal digits, NET its subnet's number or None for one without addresses."""
+    return {"name": name, "key": key, "wep": wep, "hidden": hidden, "net": net, "wpa3": wpa3}
 
 
-def access_point(radio, channel, networks, beacon=50):
+def access_point(radio, channel, networks, beacon=50, elements=b"", power=20):
     """Start hostapd on a radio of AIR with the given networks; its beacons come every BEACON
-    units of 1.024 ms."""
+    units of 1.024 ms and hold ELEMENTS too. POWER is in dBm."""
     first = f"wlan{radio}"
     lines = [f"interface={first}", "driver=nl80211", "hw_mode=g", f"channel={channel}",
              f"beacon_int={beacon}", "ctrl_interface=/run/hostapd"]
@@ -75,7 +76,12 @@ def access_point(radio, channel, networks, beacon=50):
         lines.append(f"bssid=02:00:00:00:{radio:02x}:{index:02x}")
         lines.append(f"ssid2={one['name'].hex()}")
         lines.append(f"ignore_broadcast_ssid={int(one['hidden'])}")
-        if one["key"]:
+        if elements:
+            lines.append(f"vendor_elements={elements.hex()}")
+        if one["wpa3"]:
+            lines += ["wpa=2", "wpa_key_mgmt=SAE", "rsn_pairwise=CCMP", "ieee80211w=2",
+                      f"sae_password={one['key']}"]
+        elif one["key"]:
             lines += ["wpa=2", "wpa_key_mgmt=WPA-PSK", "rsn_pairwise=CCMP",
                       f"wpa_passphrase={one['key']}"]
         if one["wep"]:
@@ -92,6 +98,8 @@ def access_point(radio, channel, networks, beacon=50):
         return "ssid" in run("iw", "dev", last, "info", netns=AIR, check=False)
 
     wait_until(up, f"radio {radio} on the air", 120)
+    if power != 20:
+        run("iw", "dev", first, "set", "txpower", "fixed", str(100 * power), netns=AIR)
     for index, one in enumerate(networks):
         if one["net"] is not None:
             device = f"{first}_{index}" if index else first

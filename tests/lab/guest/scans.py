@@ -156,12 +156,15 @@ class Recorder:
     def keep(self, *words):
         """One more file: what the tool prints, if it prints a network."""
         def answered():
-            # A scan whose end the kernel does not tell is asked for again.
+            # A simulated radio can hang in a scan; it is well again after a new start.
             done = subprocess.run(["timeout", "20", *self.tool, "dev", STATION, "scan", *words],
                                   stdout=subprocess.PIPE, stderr=subprocess.STDOUT, check=False)
             self.text = done.stdout
+            if done.returncode == 124:
+                run("ip", "link", "set", STATION, "down")
+                run("ip", "link", "set", STATION, "up")
             return done.returncode == 0
-        wait_until(answered, lambda: f"scan {words}: {self.text}", 60)
+        wait_until(answered, lambda: f"scan {words}: {self.text}", 90)
         if b"BSS " not in self.text:
             return
         self.number += 1

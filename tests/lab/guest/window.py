@@ -23,7 +23,8 @@ def begin():
     global screen, app
     screen = screen or Screen(os.environ["DISPLAY"])
     environment = dict(os.environ, GTK_MODULES="/lab/probe.so", PROBE_SOCKET=SOCKET,
-                       ASAN_OPTIONS="detect_leaks=0", UBSAN_OPTIONS="print_stacktrace=1")
+                       ASAN_OPTIONS="detect_leaks=0:verify_asan_link_order=0",
+                       UBSAN_OPTIONS="print_stacktrace=1")
     notices()
     app = Program(start("/lab/wireless-lan", log="program.log", env=environment), SOCKET, screen)
     app.wait(120)
