@@ -21,9 +21,9 @@ KEYS = {"Market": "off", "Home Net": "on", "New Home": "on", "Old School": "on"}
 def start():
     """An open network, one of WPA2, one of WPA3 and one of WEP, and the program."""
     air.access_point(1, 1, [network(b"Market", net=1),
-                            network(b"Home Net", key="correct horse", net=2)])
+                            network(b"Home Net", key="correct horse", net=2)], beacon=200)
     air.access_point(2, 6, [network(b"New Home", key="battery staple", net=3, wpa3=True),
-                            network(b"Old School", wep="0102030405", net=4)])
+                            network(b"Old School", wep="0102030405", net=4)], beacon=200)
     air.addresses(1, 2, 3, 4)
     w.begin()
     w.idle()
