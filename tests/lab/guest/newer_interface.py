@@ -112,7 +112,7 @@ def wep():
 
 
 def the_window_closes_with_status_0():
-    same(w.end(), 0, "the status")
+    same(w.app.quit(), 0, "the status")
 
 
 SCENARIOS = [
