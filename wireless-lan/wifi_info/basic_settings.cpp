@@ -26,7 +26,8 @@ static const struct {
 
 static GString *basic_setting_text(const WIFI_INTERFACE *iface)
 {
-    GString *text = g_string_sized_new(sizeof *iface); // room for all fields: never moved
+    GString *text =
+        g_string_sized_new(sizeof *iface); // enough for all fields, so it is never moved
 
     append_line(text, "iface", iface->name);
     if (iface->isstatic) {

@@ -17,9 +17,9 @@ gchar *connected_state(const char *address);
 // Removes all rows.
 void clear_network_list();
 
-// Fills the list afresh from the scanned networks: `data` (up to 127 bytes) is the state of the
-// network at connect_index, every other one is disconnected. The chosen network is highlighted
-// again. While a refresh is under way the list stays empty: the records are about to be replaced.
+// Refills the list from the scanned networks. The network at connect_index gets the state `data`
+// (127 bytes at most), all others are disconnected. The chosen network is highlighted again. During
+// a refresh the list stays empty, because its scan is about to replace the records.
 void review_tree_vanpro(const gchar *data);
 
 #endif

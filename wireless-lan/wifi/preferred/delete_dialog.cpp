@@ -61,7 +61,7 @@ void cb_configuration_delete(GtkWidget *, gpointer data)
         begin_dialog(create_delete_dialog(static_cast<GtkWidget *>(data), front_text(row)));
 
     show_dialog(dialog);
-    // Looked up afresh: rows can go while the question stands.
+    // Looked up again, because rows can go while the question is shown.
     if (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
         row < user_wifi_count)
         delete_network(row);

@@ -21,7 +21,7 @@ constexpr char ADD_BUTTON[] = "preferred_button_add";
 constexpr char DELETE_BUTTON[] = "preferred_button_delete";
 constexpr char PROPERTIES_BUTTON[] = "preferred_button_properties";
 
-// Scrolls to a row; the list itself does not, as it stands in a viewport at its full height.
+// Scrolls to a row. The list cannot do it itself, because it has its full height inside a viewport.
 static void reveal_row(GtkWidget *front, gint row)
 {
     GtkWidget *viewport = gtk_widget_get_parent(front);

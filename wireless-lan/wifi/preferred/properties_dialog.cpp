@@ -98,7 +98,7 @@ void cb_configuration_properties(GtkWidget *, gpointer data)
     connect_network_form(form);
     choose_key_mgmt(row);
     show_dialog(dialog);
-    // Looked up afresh: rows can go while the form stands.
+    // Looked up again, because rows can go while the form is shown.
     while (gtk_dialog_run(GTK_DIALOG(dialog)) == GTK_RESPONSE_OK && user_cell_lists_exist() &&
            row < user_wifi_count && !store_network(row, dialog)) {
     }

@@ -12,6 +12,7 @@
 #include "base/list_keyboard.h"
 #include "base/state.h"
 #include "base/work_area.h"
+#include "wifi.h"
 #include "wifi_info/debug.h"
 #include "wifi_info/device.h"
 #include "window/activation.h"

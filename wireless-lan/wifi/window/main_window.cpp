@@ -21,7 +21,7 @@
 #include "window/start_up.h"
 
 constexpr gint LEFT_WIDTH = 240;      // pixels, the least
-constexpr gint LIST_SIDE_WIDTH = 400; // likewise
+constexpr gint LIST_SIDE_WIDTH = 400; // the same
 // Borders and shadows around the list, and the scroll bar of a long one.
 constexpr gint LIST_SIDE_MARGIN = 60;
 
