@@ -86,6 +86,7 @@ def access_point(radio, channel, networks, beacon=50, elements=b"", power=20):
                       f"wpa_passphrase={one['key']}"]
         if one["wep"]:
             lines += ["auth_algs=1", "wep_default_key=0", f"wep_key0={one['wep']}"]
+        lines += one.get("more", ())
     path = f"/tmp/hostapd-{radio}.conf"
     with open(path, "w") as file:
         file.write("\n".join(lines) + "\n")
