@@ -28,14 +28,14 @@ release_lease() {
     # It leaves after the message.
     dhcpcd)
         kill -ALRM "$pid" 2>/dev/null
-        tries=50
+        tries=100
         while [ "$tries" -gt 0 ] && runs dhcp.pid; do
             sleep 0.1
             tries=$((tries - 1))
         done
         ;;
     dhclient)
-        limited 5 dhclient -4 -r -lf "$state/dhclient.leases" -pf "$state/dhclient.pid" \
+        limited 10 dhclient -4 -r -lf "$state/dhclient.leases" -pf "$state/dhclient.pid" \
             "$interface" >/dev/null 2>&1
         ;;
     esac
