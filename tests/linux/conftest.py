@@ -13,21 +13,27 @@ pytest.register_assert_rewrite("machine")
 import machine  # noqa: E402
 
 
+ALONE = "WIRELESS_LAN_TEST_ALONE"  # in the environment of a worker that has its own namespaces
+
+
 @pytest.hookimpl(tryfirst=True)
 def pytest_cmdline_main(config):
     if hasattr(config, "workerinput") or config.option.collectonly:
         return
     user = "" if os.geteuid() == 0 else "-r"
     place = (f"unshare {user} -mnpf --mount-proc --kill-child --propagation unchanged "
-             f"{machine.TOP}/device/sim/own-mounts {sys.executable}")
+             f"{machine.TOP}/device/sim/own-mounts env {ALONE}=yes {sys.executable}")
     workers = config.option.numprocesses
-    config.option.tx = [f"popen//python={place}"] * (workers if isinstance(workers, int) else 1)
+    workers = max(1, workers) if isinstance(workers, int) else 1
+    config.option.tx = [f"popen//python={place}"] * workers
     config.option.numprocesses = None
     config.option.dist = "load"
 
 
 @pytest.fixture(scope="session", autouse=True)
 def scratch_machine():
+    if ALONE not in os.environ:
+        pytest.exit("these tests would change this machine; start them with: pytest tests/linux", 2)
     machine.set_up()
     yield
     machine.tear_down()
