@@ -151,6 +151,8 @@ static GtkWidget *create_front_window()
     g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_select_focus), nullptr);
     g_signal_connect(front, "key-press-event", G_CALLBACK(cb_list_key), nullptr);
     name_for_ears(front, _("Preferred Network"));
+    // An empty list leaves the focus to what it is in.
+    name_for_ears(window, _("Preferred Network"));
     gtk_container_set_border_width(GTK_CONTAINER(window), 5);
     gtk_scrolled_window_set_policy(GTK_SCROLLED_WINDOW(window), GTK_POLICY_AUTOMATIC,
                                    GTK_POLICY_AUTOMATIC);
