@@ -18,7 +18,7 @@ pytest.importorskip("gi", reason="python3-gi is missing")
 
 BRIDGE = "/usr/lib/*/gtk-2.0/modules/libatk-bridge.so"
 if not glob.glob(BRIDGE):
-    pytest.skip("this system's libatk-adaptor has no bridge for GTK+ 2", allow_module_level=True)
+    pytest.skip("left out: libatk-adaptor has no bridge for GTK+ 2 here", allow_module_level=True)
 
 from screen_reader import Reader, row, selected, value, walk  # pylint: disable=wrong-import-position
 
@@ -33,8 +33,9 @@ STORED = (Network("one"), Network("two", "second"), Network("three", "third"))
 def fixture_reader(shared_device):
     """The program with a reader beside it; time passes only when a test lets it."""
     if os.getuid() != 0:
-        pytest.skip("on the device of an ordinary user the program has another user's number than "
-                    "the bus, which refuses it")
+        # On the device of an ordinary user the program has another user's number than the bus,
+        # which refuses it.
+        pytest.skip("needs root")
     d = shared_device("none", rate=50, files={FILE: file_of(*STORED)},
                       scan=scan_text("open net", ("home net", "on"), "other net"))
     for name in COMMANDS:
