@@ -23,9 +23,11 @@ static void turn_visibility(GtkEntry *entry)
         gtk_entry_set_visibility(entry, !gtk_entry_get_visibility(entry));
 }
 
-static void cb_icon(GtkEntry *entry)
+// A double click is two presses and a third event for both.
+static void cb_icon(GtkEntry *entry, GtkEntryIconPosition, GdkEvent *event, gpointer)
 {
-    turn_visibility(entry);
+    if (event->type == GDK_BUTTON_PRESS)
+        turn_visibility(entry);
 }
 
 static void cb_item(GtkMenuItem *, gpointer entry)
