@@ -213,13 +213,22 @@ class Pane:
 
     def _in_place(self, find, place, what, limit=LIMIT):
         """The widget, once it can be used, its window is in front, and its place is the same twice
-        running: not about to be moved by the window manager."""
+        running: not about to be moved by the window manager. When two dialogs go at once it may
+        leave no window active: then the press is what brings this one to the front."""
         last = []
+        left_alone = [0]
+
+        def in_front():
+            if self.tree().get("active", True):
+                return True
+            nobody = not any(one.get("active") for one in self.app.windows())
+            left_alone[0] = left_alone[0] + 1 if nobody else 0
+            return left_alone[0] >= 20
 
         def ready():
             widget = find()
             usable = widget and widget["mapped"] and widget["usable"] and widget["rect"][2] > 1 \
-                and self.tree().get("active", True)
+                and in_front()
             now = [place(widget)] if usable else []
             steady = usable and last == now
             last[:] = now
