@@ -57,14 +57,14 @@ G_MODULE_EXPORT void gtk_module_init(int *argc, char ***argv)
 
 @functools.lru_cache(maxsize=None)
 def _library():
-    with tempfile.TemporaryDirectory() as folder:
-        with open(f"{folder}/hand.c", "w", encoding="ascii") as file:
+    with tempfile.TemporaryDirectory() as directory:
+        with open(f"{directory}/hand.c", "w", encoding="ascii") as file:
             file.write(SOURCE)
         flags = subprocess.run(["pkg-config", "--cflags", "--libs", "gtk+-2.0", "gmodule-2.0"],
                                check=True, stdout=subprocess.PIPE, text=True).stdout.split()
-        subprocess.run(["cc", "-w", "-shared", "-fPIC", "-o", f"{folder}/hand.so",
-                        f"{folder}/hand.c"] + flags, check=True)
-        with open(f"{folder}/hand.so", "rb") as file:
+        subprocess.run(["cc", "-w", "-shared", "-fPIC", "-o", f"{directory}/hand.so",
+                        f"{directory}/hand.c"] + flags, check=True)
+        with open(f"{directory}/hand.so", "rb") as file:
             return file.read()
 
 

@@ -32,7 +32,7 @@ IP = "10.0.0.5"
 HOST = "Ad-Hoc Host Mode"
 NETWORKS = ("cafe", ("home net", "on"), "bar")
 KEYS = {"cafe": "off", "home net": "home-key", "bar": "off", "board": "off"}
-# The device joins what it is told.
+# The device joins what iwset asks for.
 JOIN = 'case "$*" in *Ad-Hoc*) dissociate ;;\n' + "".join(
     f'*"{name}"*) associate {address_of(row)} ;;\n'
     for row, name in enumerate(("cafe", "home net", "bar"))) + "esac"
@@ -41,7 +41,7 @@ ALL = LOCKED + ("view-press",)
 
 
 def living(device, **settings):
-    """A device that joins what it is told, connected with the first network."""
+    """A device that joins what iwset asks for, connected with the first network."""
     files = {**preferred(("", "home net", 0, 0, "home-key")),
              CONF: dhcp(essid="board").encode(), **settings.pop("files", {})}
     d, app = idle(device, *NETWORKS, files=files, **settings)
