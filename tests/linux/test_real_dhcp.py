@@ -218,13 +218,17 @@ def test_another_subnet_under_the_same_name(name, far):
 
 
 def test_lease_is_given_back(far):
-    """So that it is free for the next one; and only while its network is there."""
+    """So that it is free for the next one; and only while its network is there. No server answers
+    the message, so that nobody sees it lost: dhcpcd takes its address off right after it, and what
+    still waits for ARP then goes with the address. So each client has three chances."""
+    def comes_and_goes():
+        assert run("lnk-ifup", "wlan0")[0] == 0
+        assert run("lnk-ifdown", "wlan0")[0] == 0
+        return wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"), 10)
     for name in REAL_CLIENTS:
         process = serve(far, "10.7.0")
         install_client(name)
-        assert run("lnk-ifup", "wlan0")[0] == 0
-        assert run("lnk-ifdown", "wlan0")[0] == 0
-        assert wait_for(lambda: read(f"{machine.ROOT}/leases").count(b"10.7.0.") == 0), name
+        assert any(comes_and_goes() for _ in range(3)), name
         process.terminate()
         process.wait(20)
 
