@@ -161,6 +161,16 @@ def test_scan_that_takes_too_long():
     assert machine.wait_for(lambda: not machine.running("sleep"))
 
 
+def test_scan_that_takes_longer_than_iwlist_waits():
+    """It has a limit of its own, 15 seconds, after which it has nothing to show."""
+    late = b"wlan0     Failed to read scan data : Resource temporarily unavailable\n\n"
+    note("scan-error", late)
+    assert run("iwlist", "wlan0", "scan") == (255, b"", late)
+    note("iw-scan dump", network(b"cafe"))
+    assert [one["essid"] for one in scan()] == [b"cafe"]
+    assert {tuple(call[1:]) for call in calls("iw")} == {(b"dev", b"wlan0", b"scan", b"dump")}
+
+
 @pytest.mark.parametrize("error, reason", [
     (b"command failed: No such device (-19)\n", b"no-interface\n"),
     (b"command failed: Network is down (-100)\n", b"command failed: Network is down (-100)\n")])
