@@ -66,8 +66,8 @@ def access_point(radio, channel, networks, beacon=50, elements=b"", power=20):
     """Start hostapd on a radio of AIR with the given networks; its beacons come every BEACON
     units of 1.024 ms and hold ELEMENTS too. POWER is in dBm."""
     first = f"wlan{radio}"
-    lines = [f"interface={first}", "driver=nl80211", "hw_mode=g", f"channel={channel}",
-             f"beacon_int={beacon}", "ctrl_interface=/run/hostapd"]
+    lines = [f"interface={first}", "driver=nl80211", f"hw_mode={'g' if channel < 15 else 'a'}",
+             f"channel={channel}", f"beacon_int={beacon}", "ctrl_interface=/run/hostapd"]
     for index, one in enumerate(networks):
         if index:
             lines.append(f"bss={first}_{index}")

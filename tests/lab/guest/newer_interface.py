@@ -11,7 +11,7 @@ import window as w
 from air import network, run
 from probe import wait_until
 from steps import (answer_encrypted, check, connected_to, followed, linked, press_button,
-                   press_connect, same, wanted_row)
+                   press_connect, same, wanted_row, write_preferred)
 
 SIOCGIWAP = 0x8B15
 COMMANDS = "/usr/lib/wireless-lan/device"
@@ -111,6 +111,26 @@ def wep():
     address_is_told()
 
 
+def the_second_of_the_preferred_networks_by_itself():
+    run("/sbin/lnk-ifdown", "wlan0")
+    write_preferred(network(b"Elsewhere", key="never heard of"),
+                    network(b"Home Net", key="correct horse"), network(b"Market"))
+    run("wireless-lan-auto", "--daemon", "wlan0")
+    wait_until(lambda: "is looked after" in run("wireless-lan-auto", "--status", "wlan0",
+                                                check=False), "the automatic", 60)
+    # The user has left the last network by hand.
+    run("wireless-lan-auto", "--now", "wlan0")
+    wait_until(lambda: "inet 10.9.2." in run("ip", "-4", "addr", "show", "dev", "wlan0"),
+               "an address of its network", 300)
+    w.refresh_until(lambda now: w.connected_row(2) is not None, "a connected row")
+    w.select(w.connected_row(2))
+    wait_until(lambda: w.app.label("button-connect") == "gtk-disconnect", "the button")
+    same(w.rows()[connected_to(2)][0], "Home Net", "the connected network")
+    address_is_told()
+    w.photograph("joined-by-itself")
+    run("wireless-lan-auto", "--stop", "wlan0")
+
+
 def the_window_closes_with_status_0():
     same(w.app.quit(), 0, "the status")
 
@@ -124,5 +144,6 @@ SCENARIOS = [
     wpa2,
     wpa3,
     wep,
+    the_second_of_the_preferred_networks_by_itself,
     the_window_closes_with_status_0,
 ]

@@ -9,6 +9,8 @@ from probe import wait_until
 
 
 OFFER = "Do you want to add this configuration to the preferred network?"
+RECORD = ("USERCELL {0}\nALIAS {1}\nESSID {1}\nMODE Master\nKMGMT {2}\nKINDEX 0\nEncryption {3}\n"
+          "KEY {4}\n")
 
 
 def check(condition, reason):
@@ -20,7 +22,7 @@ def same(got, wanted, what):
     check(got == wanted, f"{what} is {got!r}, not {wanted!r}")
 
 
-def connected_to(net, limit=90):
+def connected_to(net, limit=90, card="wlan0"):
     """Waits until a row shows an address of subnet NET and the window is idle; returns the row."""
     wait_until(lambda: w.connected_row(net) is not None,
                lambda: f"a row with an address of 10.9.{net}.x in {w.rows()}", limit)
@@ -28,7 +30,7 @@ def connected_to(net, limit=90):
     w.idle()
     same(w.app.label("button-connect"), "gtk-disconnect", "the button")
     shown = w.rows()[row][4][len("Connected\nIP Address:"):]
-    have = re.findall(r"inet ([0-9.]+)/", run("ip", "-4", "addr", "show", "dev", "wlan0"))
+    have = re.findall(r"inet ([0-9.]+)/", run("ip", "-4", "addr", "show", "dev", card))
     same(have, [shown], "the interface's address, as shown,")
     same([i for i, one in enumerate(w.rows()) if one[4].startswith("Connected")], [row],
          "the rows called connected")
@@ -49,6 +51,15 @@ def answer_encrypted(key, remember=None, index=0, alias=""):
         if remember:
             prompt.type("GtkEntry", alias)
         prompt.press("gtk-yes" if remember else "gtk-no")
+
+
+def write_preferred(*networks):
+    """The list of preferred networks, as the window writes it."""
+    with open("/etc/wireless-user.conf", "w") as file:
+        for number, one in enumerate(networks):
+            key = one["key"]
+            file.write(RECORD.format(number, one["name"].decode(), int(bool(key)),
+                                     "open" if key else "off", key or "off"))
 
 
 def wanted_row(name):
@@ -86,9 +97,9 @@ def followed(*numbers, limit=20):
     same(got, list(numbers), "the notices to the desktop")
 
 
-def linked():
-    """The address of the access point that the kernel is associated with, or None."""
-    found = re.search(r"Connected to ([0-9a-f:]+)", run("iw", "dev", "wlan0", "link", check=False))
+def linked(card="wlan0"):
+    """The address of the access point that the kernel has a card associated with, or None."""
+    found = re.search(r"Connected to ([0-9a-f:]+)", run("iw", "dev", card, "link", check=False))
     return found and found.group(1)
 
 
@@ -108,3 +119,19 @@ def write_addresses(box, *values):
     tick(box, "staticwlan0")
     for name, value in zip(("address", "netmask", "broadcast", "gateway"), values):
         box.type(name, value)
+
+
+def host(name, *addresses):
+    """Has the settings host a network of this name, with these addresses."""
+    box = open_settings()
+    write_addresses(box, *addresses)
+    tick(box, "adhoc-hostwlan0")
+    box.press("gtk-preferences")
+    details = w.app.dialog("Ad-Hoc Information")
+    details.type("GtkEntry", name)
+    details.press("gtk-ok")
+    details.wait_gone()
+    w.notices()
+    box.press("gtk-ok")
+    box.wait_gone()
+    wait_until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")

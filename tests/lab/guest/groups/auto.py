@@ -10,10 +10,12 @@ import signal
 import time
 
 import air
+import hwsim
 import window as w
 from air import network, run
 from probe import wait_until
-from steps import check, connected_to, linked, press_button, press_connect, same, wanted_row
+from steps import (check, connected_to, linked, press_button, press_connect, same,
+                   wanted_row, write_preferred)
 
 FIRST = network(b"First", key="the first key", net=1)
 SECOND = network(b"Second", key="second to none", net=2)
@@ -23,8 +25,6 @@ STATIONS = {"02:00:00:00:01:00": "First", "02:00:00:00:02:00": "Second",
             "02:00:00:00:03:00": "Third", "02:00:00:00:03:01": "Fourth"}
 STATE = "/run/wireless-lan/wlan0"
 LIST = "user_cell_list_front"
-RECORD = ("USERCELL {0}\nALIAS {1}\nESSID {1}\nMODE Master\nKMGMT {2}\nKINDEX 0\nEncryption {3}\n"
-          "KEY {4}\n")
 
 
 def prepare():
@@ -32,11 +32,7 @@ def prepare():
     air.access_point(2, 6, [SECOND])
     air.access_point(3, 11, [THIRD, FOURTH])
     air.addresses(1, 2, 3, 4)
-    with open("/etc/wireless-user.conf", "w") as file:
-        for number, one in enumerate((FIRST, SECOND, THIRD)):
-            key = one["key"]
-            file.write(RECORD.format(number, one["name"].decode(), int(bool(key)),
-                                     "open" if key else "off", key or "off"))
+    write_preferred(FIRST, SECOND, THIRD)
 
 
 def where():
@@ -56,13 +52,20 @@ def supplicant():
     return int(number), int(ticks) / os.sysconf("SC_CLK_TCK")
 
 
-def start_of_the_machine(net, what):
-    """The automatic as the machine's start has it; tells how long an address takes."""
-    run("wireless-lan-auto", "--daemon", "wlan0")
-    wait_until(lambda: address() == net, lambda: f"an address of {net}, there is {address()}", 300)
+def uptime():
+    """How long the machine has been on, in seconds."""
     with open("/proc/uptime") as file:
-        taken = float(file.read().split()[0]) - supplicant()[1]
-    print(f"auto: {what}: {taken:.1f} s from the supplicant's start to an address")
+        return float(file.read().split()[0])
+
+
+def start_of_the_machine(net, what, *tracer):
+    """The automatic as the machine's start has it; tells how long an address takes."""
+    begun = uptime()
+    air.start(*tracer, "wireless-lan-auto", "--daemon", "wlan0")
+    wait_until(lambda: address() == net, lambda: f"an address of {net}, there is {address()}", 300)
+    now = uptime()
+    print(f"auto: {what}: an address {now:.1f} s after power-on, {now - begun:.1f} s after the start "
+          f"of the automatic, {now - supplicant()[1]:.1f} s after that of the supplicant")
 
 
 def end_of_the_machine():
@@ -145,6 +148,31 @@ def a_new_start_of_the_machine_joins_the_second_again():
     start_of_the_machine(2, "second boot")
 
 
+def nothing_is_started_with_a_key():
+    """No process list ever shows one, however short: every program is caught as it is started."""
+    end_of_the_machine()
+    tracer = ("strace", "-f", "-v", "-s", "4096", "-e", "trace=execve", "-o", "/tmp/started")
+    start_of_the_machine(2, "traced boot", *tracer)
+    run("pkill", "strace")
+    with open("/tmp/started", "rb") as file:
+        started = file.read()
+    for name in (b"wpa_supplicant", b"wpa_cli", b"awk", b"udhcpc"):
+        check(b'/' + name + b'", [' in started, f"{name} has not been seen")
+    for one in (FIRST, SECOND):
+        for key in (one["key"].encode(), one["key"].encode().hex().encode()):
+            found = [line for line in started.splitlines() if key in line]
+            same(found, [], f"what is started with the key of {one['name']}")
+
+
+def a_card_that_is_pulled_and_put_in_again():
+    hwsim.remove_radio(0, "wlan0")
+    wait_until(lambda: not run("pidof", "wpa_supplicant", check=False), "the supplicant's end", 60)
+    begun = time.monotonic()
+    hwsim.add_radio("wlan0")
+    wait_until(lambda: address() == 2, lambda: f"an address of 2, there is {address()}", 300)
+    print(f"auto: card: {time.monotonic() - begun:.1f} s from the card to an address")
+
+
 def the_order_of_the_window_is_taken_over():
     air.access_point(1, 1, [FIRST])
     before = supplicant()[0]
@@ -182,6 +210,8 @@ SCENARIOS = [
     a_network_joined_by_hand_stays,
     after_a_disconnect_nothing_is_joined,
     a_new_start_of_the_machine_joins_the_second_again,
+    nothing_is_started_with_a_key,
+    a_card_that_is_pulled_and_put_in_again,
     the_order_of_the_window_is_taken_over,
     an_address_comes_back_with_the_network,
 ]

@@ -3,10 +3,11 @@
 
 import os
 import re
-import subprocess
 
 import air
+import commands
 from air import network, run
+from commands import iwset, reason, supplicant
 from probe import wait_until
 from steps import check, same
 
@@ -45,38 +46,9 @@ def prepare():
     air.addresses(*range(1, 9))
 
 
-def iwset(name, key="off", enc="off"):
-    """Joins as the window does; the status and what was said."""
-    words = ["wlan0", "essid", name, "mode", "Managed", "key", key, "enc", enc]
-    words = ["wpa", *words] if enc != "off" else [*words, "[1]"]
-    done = subprocess.run(["/sbin/iwset", *words], stdout=subprocess.PIPE,
-                          stderr=subprocess.STDOUT, check=False, timeout=60)
-    return done.returncode, done.stdout.decode(errors="replace")
-
-
-def supplicant(*words):
-    return run("wpa_cli", "-p", "/run/wireless-lan/wlan0/control", "-i", "wlan0", *words,
-               check=False)
-
-
-def reason():
-    try:
-        with open("/run/wireless-lan/reason") as file:
-            return file.read()
-    except FileNotFoundError:
-        return ""
-
-
 def joined(net, management):
-    """The supplicant is in, as it should be, and the network's own server gives an address."""
-    wait_until(lambda: "wpa_state=COMPLETED" in supplicant("status"),
-               lambda: f"the join in {supplicant('status')}", 40)
+    commands.joined(net)
     same(re.findall(r"^key_mgmt=(.*)$", supplicant("status"), re.M), [management], "the management")
-    same(reason(), "", "the reason")
-    run("/sbin/lnk-ifup", "wlan0")
-    have = re.findall(r"inet (10\.9\.[0-9]+)\.", run("ip", "-4", "addr", "show", "dev", "wlan0"))
-    same(have, [f"10.9.{net}"], "the network of the address")
-    run("ping", "-c", "1", "-W", "10", f"10.9.{net}.1")
 
 
 def join(name, net, management):

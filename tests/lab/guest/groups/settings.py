@@ -7,8 +7,8 @@ import air
 import window as w
 from air import FAR, network, run
 from probe import wait_until
-from steps import (check, connected_to, followed, open_settings, press_button, press_connect, same,
-                   tick, wanted_row, write_addresses)
+from steps import (check, connected_to, followed, host, open_settings, press_button, press_connect,
+                   same, tick, wanted_row, write_addresses)
 
 
 def prepare():
@@ -79,18 +79,7 @@ def an_invalid_address_is_refused():
 
 
 def a_hosted_network_is_seen_and_joined_by_a_second_station():
-    box = open_settings()
-    write_addresses(box, "10.9.77.1", "255.255.255.0", "10.9.77.255", "10.9.77.1")
-    tick(box, "adhoc-hostwlan0")
-    box.press("gtk-preferences")
-    details = w.app.dialog("Ad-Hoc Information")
-    details.type("GtkEntry", "Our own")
-    details.press("gtk-ok")
-    details.wait_gone()
-    w.notices()
-    box.press("gtk-ok")
-    box.wait_gone()
-    wait_until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")
+    host("Our own", "10.9.77.1", "255.255.255.0", "10.9.77.255", "10.9.77.1")
     followed("3")
     check(not w.app.find("button-connect")["usable"], "Connect is sensitive")
     w.photograph("hosting")
