@@ -118,8 +118,8 @@ def test_columns(app):
     renderers = [one["renderers"] for one in columns]
     assert [len(one) for one in renderers] == [1] * 5
     assert len({one[0]["id"] for one in renderers}) == 1, "one renderer serves them all"
-    assert renderers[0][0]["type"] == "GtkCellRendererText"
-    assert renderers[0][0]["foreground"] == "#55556b6b2f2f"  # DarkOliveGreen
+    assert renderers[0][0]["type"] == "RowText"
+    assert renderers[0][0]["foreground"] == "#55556b6b2f2f"  # DarkOliveGreen; only text renderers have one
 
 
 def test_all_columns_are_in_sight(app):

@@ -11,7 +11,7 @@ static gint wanted_width(GtkTreeViewColumn *column)
     return MAX(column->requested_width, column->button_request);
 }
 
-// The name gives up what the other columns need, and is drawn with an ellipsis then. A width that
+// The name gives up what the other columns need. A width that
 // the user has set stays.
 static void cb_room_changed(GtkWidget *viewport, GtkAllocation *room, gpointer data)
 {
@@ -31,20 +31,6 @@ static void cb_room_changed(GtkWidget *viewport, GtkAllocation *room, gpointer d
         limit = -1;
     if (limit != gtk_tree_view_column_get_max_width(name))
         gtk_tree_view_column_set_max_width(name, limit);
-}
-
-// A column asks for what its texts need; only while they are drawn they are fitted into what it has
-// got. The view's own handler ends the signal, so it is called from here.
-static gboolean cb_draw(GtkWidget *view, GdkEventExpose *event, gpointer renderer)
-{
-    g_object_set(renderer, "ellipsize", PANGO_ELLIPSIZE_END, nullptr);
-
-    const gboolean drawn = GTK_WIDGET_GET_CLASS(view)->expose_event(view, event);
-
-    g_object_set(renderer, "ellipsize", PANGO_ELLIPSIZE_NONE, nullptr);
-    // A second run of the handler would undo that.
-    g_signal_stop_emission_by_name(view, "expose-event");
-    return drawn;
 }
 
 // The whole name, where the column does not show it.
@@ -119,7 +105,6 @@ void fit_columns(GtkWidget *view, GtkCellRenderer *renderer)
         gtk_tree_view_column_set_resizable(GTK_TREE_VIEW_COLUMN(at->data), TRUE);
     g_signal_connect_after(gtk_widget_get_parent(view), "size-allocate",
                            G_CALLBACK(cb_room_changed), view);
-    g_signal_connect(view, "expose-event", G_CALLBACK(cb_draw), renderer);
     gtk_widget_set_has_tooltip(view, TRUE);
     g_signal_connect(view, "query-tooltip", G_CALLBACK(cb_tooltip), nullptr);
     g_signal_connect(view, "style-set", G_CALLBACK(cb_style), renderer);

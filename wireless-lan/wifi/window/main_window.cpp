@@ -18,6 +18,7 @@
 #include "window/columns.h"
 #include "window/halves.h"
 #include "window/refresh.h"
+#include "window/row_text.h"
 #include "window/start_up.h"
 
 constexpr gint LEFT_WIDTH = 240;      // pixels, the least
@@ -89,7 +90,7 @@ static void arrange_tree_view(GtkWidget *view)
 {
     const char *const titles[] = {_("ESSID"), _("Mode"), _("KEY"), _("Signal strength"),
                                   _("State")};
-    GtkCellRenderer *renderer = gtk_cell_renderer_text_new();
+    GtkCellRenderer *renderer = row_text_new();
 
     g_object_set(renderer, "foreground", "DarkOliveGreen", nullptr);
     for (gint column = 0; column < static_cast<gint>(G_N_ELEMENTS(titles)); column++)
