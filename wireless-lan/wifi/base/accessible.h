@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: MIT
-// What assistive technology says of a control whose own text does not tell.
+// What assistive technology says of a control whose own text does not tell. Nothing happens where
+// GTK+ has been started without it (no module of GTK_MODULES implements ATK).
 
 #ifndef WIFI_BASE_ACCESSIBLE_H
 #define WIFI_BASE_ACCESSIBLE_H

@@ -93,7 +93,10 @@ void use_program_icon(GtkWidget *window)
         draw_pixel(i % ICON_SIZE, i / ICON_SIZE,
                    gdk_pixbuf_get_pixels(icon) + i / ICON_SIZE * gdk_pixbuf_get_rowstride(icon) +
                        4 * (i % ICON_SIZE));
-    // The default counts for windows that are shown from now on.
-    gtk_window_set_default_icon(icon);
-    gtk_window_set_icon(GTK_WINDOW(window), icon);
+
+    GList icons = {icon, nullptr, nullptr};
+
+    // gtk_window_set_icon() also makes a pixmap for window managers that know nothing better, with
+    // 48 KiB of working memory that is never given back.
+    gdk_window_set_icon_list(gtk_widget_get_window(window), &icons);
 }

@@ -12,8 +12,8 @@
 // after gtk_init and before the first icon.
 void use_built_in_icons();
 
-// Gives `window` and those that follow the program's icon, drawn here so that no file and no theme
-// is needed for it.
+// Gives `window`, which must be realized, the program's icon, drawn here so that no file and no
+// theme is needed for it. Window managers show it for the dialogs of a window too.
 void use_program_icon(GtkWidget *window);
 
 #endif

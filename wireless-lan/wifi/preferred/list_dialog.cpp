@@ -147,6 +147,8 @@ static GtkWidget *create_front_window()
     GtkWidget *window = gtk_scrolled_window_new(nullptr, nullptr);
     GtkWidget *front = build_user_cell_clist();
 
+    // Here and not where the list is made: the program would wait for the fonts as it starts.
+    gtk_clist_set_column_auto_resize(GTK_CLIST(front), 0, TRUE);
     g_signal_connect_after(front, "select-row", G_CALLBACK(cb_reveal_selected), nullptr);
     g_signal_connect_after(front, "scroll-vertical", G_CALLBACK(cb_select_focus), nullptr);
     g_signal_connect(front, "key-press-event", G_CALLBACK(cb_list_key), nullptr);

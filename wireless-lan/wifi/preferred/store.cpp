@@ -152,7 +152,6 @@ static void create_lists(gboolean say)
     drop_list(backend_list);
     my_wifi->user_cell_index = -1;
     front_list = create_registered_list(1, FRONT_KEY);
-    gtk_clist_set_column_auto_resize(GTK_CLIST(front_list), 0, TRUE);
     g_signal_connect(front_list, "select-row", G_CALLBACK(clist_select_row), nullptr);
     g_signal_connect(front_list, "unselect-row", G_CALLBACK(cb_unselect_row), nullptr);
     backend_list = create_registered_list(LIST_COLUMNS, BACKEND_KEY);

@@ -4,7 +4,7 @@
 #include <cstring>
 
 constexpr gsize LONGEST = 16; // bytes of a text whose size is remembered, with its NUL
-constexpr guint SLOTS = 128;
+constexpr guint SLOTS = 64;
 
 struct SizeOfText {
     char text[LONGEST];
