@@ -70,7 +70,7 @@ for part in /*; do
         mount --rbind "$part" ".$part"
     fi
 done
-exec chroot . "$2" connected sh -c "ip -4 -o address show wlan0; echo done"
+PATH=$PATH:/usr/sbin exec chroot . "$2" connected sh -c "ip -4 -o address show wlan0; echo done"
 """
 
 

@@ -119,7 +119,8 @@ def test_columns(app):
     assert [len(one) for one in renderers] == [1] * 5
     assert len({one[0]["id"] for one in renderers}) == 1, "one renderer serves them all"
     assert renderers[0][0]["type"] == "RowText"
-    assert renderers[0][0]["foreground"] == "#55556b6b2f2f"  # DarkOliveGreen; only text renderers have one
+    # Only text renderers have a foreground; this is DarkOliveGreen.
+    assert renderers[0][0]["foreground"] == "#55556b6b2f2f"
 
 
 def test_all_columns_are_in_sight(app):

@@ -134,14 +134,25 @@ std::string read_file(const std::string &path)
     return content.str();
 }
 
+std::vector<std::string> names_in(const std::string &directory)
+{
+    std::vector<std::string> found;
+    g_autoptr(GDir) entries = g_dir_open(directory.c_str(), 0, nullptr);
+    if (!entries)
+        abort();
+    while (const gchar *name = g_dir_read_name(entries))
+        found.push_back(name);
+    std::sort(found.begin(), found.end());
+    return found;
+}
+
 std::vector<std::string> open_descriptors()
 {
     std::vector<std::string> found;
-    for (const auto &entry : std::filesystem::directory_iterator("/proc/self/fd")) {
-        g_autofree gchar *target = g_file_read_link(entry.path().c_str(), nullptr);
+    for (const std::string &number : names_in("/proc/self/fd")) {
+        g_autofree gchar *target = g_file_read_link(("/proc/self/fd/" + number).c_str(), nullptr);
         if (target && !strstr(target, "/proc/"))
-            found.push_back(entry.path().filename().string() + " " + target);
+            found.push_back(number + " " + target);
     }
-    std::sort(found.begin(), found.end());
     return found;
 }

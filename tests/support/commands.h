@@ -31,6 +31,10 @@ const std::string &memory_directory();
 void write_file(const std::string &path, const std::string &content);
 std::string read_file(const std::string &path); // aborts when it cannot be read
 
+// The names in a directory, sorted; aborts when it cannot be read. Not std::filesystem's iterator:
+// GCC 14 leaves a function of it out when both sanitizers are on, and the linker misses it.
+std::vector<std::string> names_in(const std::string &directory);
+
 // The open descriptors of this process, each with the name of its file.
 std::vector<std::string> open_descriptors();
 

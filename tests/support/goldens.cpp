@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: MIT
 #include "goldens.h"
 
-#include <algorithm>
-#include <filesystem>
+#include <cstring>
 
 #include <glib.h>
 
@@ -11,13 +10,13 @@
 std::vector<golden> goldens(const std::string &directory, const std::string &suffix)
 {
     std::vector<golden> found;
-    for (const auto &entry : std::filesystem::directory_iterator(GOLDENS "/" + directory)) {
-        std::filesystem::path path = entry.path();
-        if (path.extension() == ".txt")
-            found.push_back({path.stem(), path, read_file(path.replace_extension(suffix))});
+    const std::string place = std::string(GOLDENS "/") + directory + "/";
+    for (const std::string &name : names_in(place)) {
+        if (!g_str_has_suffix(name.c_str(), ".txt"))
+            continue;
+        const std::string stem = name.substr(0, name.size() - strlen(".txt"));
+        found.push_back({stem, place + name, read_file(place + stem + suffix)});
     }
-    std::sort(found.begin(), found.end(),
-              [](const golden &a, const golden &b) { return a.name < b.name; });
     return found;
 }
 
