@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: MIT
 #include "base/work_area.h"
 
+#include <cstring>
+
 #include <X11/Xatom.h>
 #include <gdk/gdkx.h>
 
@@ -43,8 +45,9 @@ static gboolean read_cardinals(GdkScreen *screen, const char *name, glong offset
     const gboolean whole = status == Success && type == XA_CARDINAL && format == 32 &&
                            items == static_cast<unsigned long>(count);
 
-    for (glong i = 0; whole && i < count; i++)
-        values[i] = reinterpret_cast<const unsigned long *>(data)[i];
+    // A cardinal of 32 bits comes as a long.
+    if (whole)
+        memcpy(values, data, sizeof *values * items);
     if (data != nullptr)
         XFree(data);
     return whole;
