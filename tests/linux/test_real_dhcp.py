@@ -123,18 +123,14 @@ def test_lease(name, dns, wanted, server):
     assert read("/etc/resolv.conf") == b"nameserver 192.0.2.53\n"
 
 
-@pytest.mark.parametrize("name", REAL_CLIENTS)
-def test_a_second_card_leaves_the_default_route_of_the_first(name, server):
-    install_client(name)
+def test_a_second_card_leaves_the_default_route_of_the_first(server):
+    install_client("udhcpc")
     first, second = b"default via 10.7.0.1 dev wlan0", b"default via 10.7.1.1 dev wlan1"
     for card in ("wlan0", "wlan1"):
         settings(f"iface {card}\naddrtype dhcp\ndns manual\n{GROUP}")
         assert run("lnk-ifup", card)[0] == 0
     assert wait_for(lambda: second in routes())
     assert first in routes()
-    assert run("lnk-ifup", "wlan0")[0] == 0
-    assert wait_for(lambda: first in routes())
-    assert second in routes()
     static("10.7.0.9", "255.255.255.0", "10.7.0.255", "10.7.0.1")
     assert run("lnk-ifup", "wlan0")[0] == 0
     assert first in routes() and second in routes()
