@@ -68,8 +68,11 @@ take_from_clients() {
             limited 15 ifdown "$interface" >/dev/null 2>&1; then
             say "ifupdown has brought $interface down; its stanza in /etc/network/interfaces should go"
         fi
-        ! is_other_client "$other" || ! kill "${other#*:}" 2>/dev/null ||
+        if is_other_client "$other"; then
+            # What it has begun to do with a lease it does to the end.
+            end_process "${other#*:}"
             say "another DHCP client on $interface has been ended: ${other%:*}"
+        fi
     done
 }
 
