@@ -5,7 +5,7 @@
 #   choice        what the user wants of it; there is none while the automatic decides
 #   automatic     the supplicant that runs was started by the automatic
 #   follower.pid  wpa_cli, which tells wpa-action of every association of our supplicant
-#   addressed     lnk-ifup has been asked for an address in this network
+#   addressed     the moment at which lnk-ifup was asked for an address in this network
 #   list          the list that the automatic has worked with last
 #   no-wep        the supplicant that runs knows no WEP
 #   next.conf     the supplicant's next configuration, taken over once its network is lost
@@ -24,6 +24,12 @@ this_boot() {
     boot=
     { read -r boot </proc/sys/kernel/random/boot_id; } 2>/dev/null
     printf '%s\n' "${boot:-unknown}"
+}
+
+# moment: the time since the machine was started, in hundredths of a second; in $moment.
+moment() {
+    read -r moment _ </proc/uptime
+    moment=${moment%.*}${moment#*.}
 }
 
 # note_choice WORD: "hand" for a network that the user has joined, "off" for none at all.
