@@ -167,8 +167,9 @@ def assert_refused(status, words):
     return result
 
 
-def assert_refused_after_leaving(words):
+def assert_refused_after_leaving(words, word):
     result = assert_refused(1, words)
+    assert reason() == f"{word}\n".encode()
     assert not alive(supplicants()[-1])
     assert not os.path.exists(f"{STATE}/wpa_supplicant.conf")
     return result
@@ -190,20 +191,21 @@ def test_refused_interface_that_is_not_there():
 
 @pytest.mark.parametrize("name", ["", "x" * 33])
 def test_refused_name(name):
-    assert_refused_after_leaving(joining.arguments(name))
+    assert_refused_after_leaving(joining.arguments(name), "bad-name")
 
 
 @pytest.mark.parametrize("key", ["1234", "123456", "123456789", "12345678901",
                                  "0123456789abcdefABCDEF012x", "x" * 40])
 def test_refused_wep_key(key):
-    result = assert_refused_after_leaving(joining.arguments("x", key, "open"))
+    result = assert_refused_after_leaving(joining.arguments("x", key, "open"), "bad-wep-key")
     assert key.encode() not in result[1] + result[2]
 
 
 @pytest.mark.parametrize("key", ["1234567", "x" * 64, "0" * 63 + "g", "0" * 65, "off", "",
                                  "12345678\t", "1234567\n8", "1234567\x7f8"])
 def test_refused_wpa_key(key):
-    result = assert_refused_after_leaving(joining.arguments("x", key, "open", wpa=True))
+    result = assert_refused_after_leaving(joining.arguments("x", key, "open", wpa=True),
+                                          "bad-wpa-key")
     assert len(key) < 4 or key.encode() not in result[1] + result[2]
 
 
