@@ -7,19 +7,19 @@
 #include <gtk/gtk.h>
 
 // A new label with the underscore before the first letter that is not in `taken`. In the scripts
-// that have no letters for keys the letter stands behind the word, as in "(_D)": it comes from the
-// name of the item then. NULL when all are taken.
+// that have no letters for keys the letter follows the word, as in "(_D)": it comes from the name
+// of the item then. NULL when all are taken.
 static gchar *move_letter(const gchar *label, const gchar *stock_id, const GString *taken)
 {
     const gchar *old = strchr(label, '_');
-    const gboolean behind = old > label && old[-1] == '(';
+    const gboolean follows = old > label && old[-1] == '(';
 
-    for (const gchar *at = behind ? stock_id + strlen("gtk-") : label; *at != '\0'; at++) {
+    for (const gchar *at = follows ? stock_id + strlen("gtk-") : label; *at != '\0'; at++) {
         const gchar letter = g_ascii_tolower(*at);
 
         if (!g_ascii_isalpha(letter) || strchr(taken->str, letter) != nullptr)
             continue;
-        if (behind)
+        if (follows)
             return g_strdup_printf("%.*s_%c%s", static_cast<int>(old - label), label,
                                    g_ascii_toupper(letter), old + 2);
 

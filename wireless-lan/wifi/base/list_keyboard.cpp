@@ -54,7 +54,7 @@ static gint cursor_row(GtkTreeView *view)
     return row;
 }
 
-// Where a row stands in the view, which is as high as all its rows, in a viewport.
+// Where a row is in the view, which is as high as all its rows, in a viewport.
 static GdkRectangle row_area(GtkTreeView *view, gint row)
 {
     GtkTreePath *path = gtk_tree_path_new_from_indices(row, -1);

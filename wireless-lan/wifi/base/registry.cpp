@@ -46,7 +46,7 @@ void set_title_label(const gchar *text)
 {
     GtkWidget *label = find_widget(TITLE_LABEL);
 
-    // A text that stands there already is not announced a second time.
+    // The same text is not announced a second time.
     if (label != nullptr && strcmp(gtk_label_get_text(GTK_LABEL(label)), text) != 0)
         gtk_label_set_text(GTK_LABEL(label), text);
 }

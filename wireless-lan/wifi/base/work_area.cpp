@@ -68,11 +68,11 @@ GdkRectangle work_area(GdkScreen *screen)
                                static_cast<gint>(area[2]), static_cast<gint>(area[3])};
     GdkRectangle result;
 
-    // When the screen is turned, the window manager tells of the new area a moment later.
+    // When the screen is turned, the window manager reports the new area a moment later.
     return gdk_rectangle_intersect(&told, &whole, &result) ? result : whole;
 }
 
-// The size that the X server knows: what GTK+ knows may be a configuration behind.
+// The size that the X server knows: GTK+ may not have seen the last change yet.
 static void shown_size(GtkWidget *window, gint *width, gint *height)
 {
     gdk_window_get_geometry(gtk_widget_get_window(window), nullptr, nullptr, width, height,
@@ -167,7 +167,7 @@ static void fit_window(GtkWidget *window)
         gtk_window_move(GTK_WINDOW(window), x, y);
 }
 
-// What a scrolled content asks for: all of it, and room for the scroll bar beside it.
+// What a scrolled content asks for: all of it, and the width of the scroll bar beside it.
 static void cb_request_content(GtkWidget *scrolled, GtkRequisition *request, gpointer content)
 {
     GtkRequisition bar;
@@ -258,7 +258,7 @@ static void fit_content(GtkWidget *dialog)
     const GtkRequisition largest = largest_size(dialog);
     GtkRequisition request;
 
-    // Buttons with long words stand one above the other.
+    // Buttons with long words are stacked.
     gtk_widget_size_request(gtk_dialog_get_action_area(GTK_DIALOG(dialog)), &request);
     if (request.width > largest.width)
         gtk_orientable_set_orientation(
@@ -331,7 +331,7 @@ static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *, gpointer)
     return FALSE;
 }
 
-// A window manager may tell of the frame only after it has shown the window.
+// A window manager may report the frame only after it has shown the window.
 static gboolean cb_property(GtkWidget *window, GdkEventProperty *event, gpointer)
 {
     if (event->atom == gdk_atom_intern_static_string("_NET_FRAME_EXTENTS"))

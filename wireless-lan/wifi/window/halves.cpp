@@ -59,7 +59,7 @@ static arrangement choose_arrangement(GtkWidget *pane, gint width, gint height)
     return width < height ? STACKED : NARROW;
 }
 
-// Where the handle stands in a pane of that size.
+// The position of the handle in a pane of that size.
 static gint choose_position(GtkWidget *pane, arrangement arranged, gint width, gint height)
 {
     const GtkRequisition left = needed_size(gtk_paned_get_child1(GTK_PANED(pane)));
@@ -94,7 +94,7 @@ static void share(GtkWidget *pane, gint width, gint height)
     const arrangement now = choose_arrangement(pane, width, height);
 
     set_frame_request(left, now == AS_REQUESTED && needed_size(left).height <= height);
-    // While there is room the handle stays where the user's hand has put it.
+    // While there is enough space the handle stays where the user's hand has put it.
     if (now != AS_REQUESTED || now != before) {
         gtk_orientable_set_orientation(GTK_ORIENTABLE(pane), now == STACKED
                                                                  ? GTK_ORIENTATION_VERTICAL

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: MIT
-// How the two halves of the main window share its room.
+// How the two halves of the main window share its space.
 
 #ifndef WIFI_WINDOW_HALVES_H
 #define WIFI_WINDOW_HALVES_H
@@ -14,9 +14,9 @@ constexpr gint SETTINGS_HEIGHT = 300;
 // Both halves must be in `pane`, shown and asked for their sizes.
 gint left_half_width(GtkWidget *pane);
 
-// Shares the room of a window that opens at its default size, and again whenever its size changes.
+// Shares the space of a window that opens at its default size, and again whenever its size changes.
 // On one that is too small for both halves the list's half, with the Connect button, gets its width
-// first; where it is higher than wide the halves stand one above the other.
+// first; where it is higher than wide the halves are stacked.
 void share_room(GtkWidget *window, GtkWidget *pane);
 
 #endif
