@@ -36,7 +36,8 @@ fail() {
 # reason WORD [DETAIL]: leaves the reason of a failure where the program finds it, one line of UTF-8.
 # The program knows these words and translates them: wrong-key, not-found, refused, rfkill-soft,
 # rfkill-hard, not-root, no-interface, no-driver, no-answer, no-scan, no-wep, no-hosting, no-dhcp,
-# no-lease, bad-name, bad-wep-key, bad-wpa-key, busy, missing-tool TOOL. Whatever else it finds it shows as it stands.
+# no-lease, bad-name, bad-wep-key, bad-wpa-key, busy, missing-tool TOOL. Whatever else it finds it
+# shows as it stands.
 reason() {
     # Only root has a directory there, and a reason that cannot be left is no further failure.
     { mkdir -p "$run_dir" && printf '%s\n' "$*" >"$run_dir/reason.$$" &&

@@ -33,6 +33,7 @@ void hide_from_ears(GtkWidget *image)
 {
     if (!somebody_listens())
         return;
+
     AtkObject *accessible = gtk_widget_get_accessible(image);
 
     atk_object_set_name(accessible, "");
