@@ -6,6 +6,8 @@ import time
 
 # Ends a failure; nothing measures speed with it. A slow machine may have a longer one.
 LIMIT = float(os.environ.get("WAIT_LIMIT", "20"))
+# Between two looks, at most: where looking takes more than waiting it may be longer.
+PAUSE = float(os.environ.get("WAIT_PAUSE", "0.03"))
 
 
 def wait_until(condition, what="", limit=LIMIT):
@@ -26,4 +28,4 @@ def wait_until(condition, what="", limit=LIMIT):
             raise AssertionError(f"waited {limit} s in vain: {detail or condition}")
         # A condition that takes long on a slow machine leaves that machine time for its work.
         time.sleep(max(pause, min(now - begun, 0.2)))
-        pause = min(pause * 1.5, 0.03)
+        pause = min(pause * 1.5, PAUSE)
