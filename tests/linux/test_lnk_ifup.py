@@ -2,6 +2,7 @@
 """lnk-ifup: a static address, the settings that it reads, the DHCP clients and how they end."""
 
 import os
+import re
 
 import pytest
 
@@ -235,6 +236,12 @@ def test_lease_that_comes_late():
     assert run("lnk-ifdown", "wlan0")[0] == 0
     assert not alive(client)
     assert sorted(os.listdir(STATE)) == ["choice", "lock"], "no note of a process stays"
+
+
+def test_the_reason_is_there_when_the_window_looks_for_it():
+    """It looks for an address 21 times, every two seconds; then it shows the reason."""
+    patience = re.search(rb"^patience=(\d+)$", read(f"{machine.DEVICE}/lnk-ifup"), re.M)
+    assert int(patience.group(1)) + 10 < 21 * 2
 
 
 @pytest.mark.parametrize("words", [(), ("wlan0", "x"), ("",), ("a/b",), ("-a",)])
