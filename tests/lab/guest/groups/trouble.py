@@ -17,13 +17,21 @@ def prepare():
     w.idle()
 
 
+def explained(reason, picture):
+    """The window says why; it is closed."""
+    box = w.app.dialog(text=reason)
+    w.photograph(picture)
+    box.press("gtk-close")
+    box.wait_gone()
+
+
 def a_wrong_key_is_not_connected():
     row = press_connect("Home Net")
     answer_encrypted("wrong horse", remember=False, index=1)
     w.app.wait_state(row, "Not Connect", 120)
     followed("2", "2")
+    explained("The access point refuses the key.", "wrong-key")
     w.idle()
-    w.photograph("wrong-key")
 
 
 def the_right_key_after_it():
@@ -38,9 +46,9 @@ def without_addresses_the_address_is_invalid():
     w.app.wait_state(row, "Connected\nAcquire IP address...")
     w.app.wait_state(row, "Connected\nIP address invalid", 120)
     followed("2", "3")
+    explained("No DHCP server has given an address.", "no-address")
     w.idle()
     same(w.app.label("button-connect"), "gtk-disconnect", "the button")
-    w.photograph("no-address")
 
 
 def an_access_point_that_goes_away():
@@ -69,6 +77,7 @@ def an_access_point_that_is_gone_before_the_press():
     press_button("gtk-connect")
     w.app.wait_state(row, "Not Connect", 120)
     followed("2", "2")
+    explained("The network is out of reach.", "out-of-reach")
     w.idle()
 
 
