@@ -114,6 +114,24 @@ def test_connect_with_a_key(reader, window):
     assert b"ALIAS mine\nESSID home net\n" in d.file(FILE)
 
 
+def test_a_connect_that_fails(reader, window):
+    d, app = reader.device, reader.device.apps[-1]
+    reader.go(window, "Wireless network selection", "table")
+    networks = reader.find(window, "Wireless network selection", "table")
+    d.display.key("Down")
+    wait_until(lambda: [one[0] for one in selected(networks)] == ["other net"], "the next row")
+    d.dissociate()
+    d.clear_commands()
+    reader.heard.clear()
+    d.display.key("Return")
+    reader.find(window, CONNECTING, "status bar")
+    pass_time(d, app, 100)
+    d.wait_command("iwset")
+    poll_link(d, app, 21)
+    wait_until(lambda: row(networks, 2)[-1] == "Not Connect", "the end of it")
+    reader.announced(CONNECTING, IDLE)
+
+
 def test_edit_the_preferred_list(reader, window):
     d = reader.device
     reader.press(window, "Preferred Network")
@@ -169,3 +187,20 @@ def test_change_the_settings(reader, window):
     reader.press(dialog, "OK")
     reader.wait_gone("WLAN Setting")
     assert d.file(CONF) == static().encode()
+
+
+def test_host_a_network(reader, window):
+    d = reader.device
+    reader.press(window, "WLAN Setting")
+    settings = reader.window("WLAN Setting")
+    reader.go(settings, "Ad-Hoc Host", "check box")
+    d.display.key("space")
+    reader.press(settings, "Preferences")
+    dialog = reader.window("Ad-Hoc Information")
+    assert reader.nameless(dialog) == []
+    reader.enter(dialog, "ESSID", "den")
+    d.display.key("Return")
+    reader.wait_gone("Ad-Hoc Information")
+    reader.press(reader.window("WLAN Setting"), "OK")
+    reader.wait_gone("WLAN Setting")
+    assert reader.find(window, "Ad-Hoc Host Mode", "status bar")
