@@ -7,7 +7,7 @@ import re
 import subprocess
 import time
 
-from harness import wait_until
+from harness import CATALOGUES, wait_until
 from harness.device import TOP, scan_text
 from preferred import FILE, FRONT, Network, file_of
 from settings_page import CONF, static
@@ -64,12 +64,12 @@ def catalogues(language):
     if SPOKEN[language] in ("de", "zh_CN"):
         content = subprocess.run(["msgfmt", "-o", "-", f"{TOP}/po/{SPOKEN[language]}.po"],
                                  check=True, stdout=subprocess.PIPE).stdout
-        return {f"/share/locale/{SPOKEN[language]}/LC_MESSAGES/wireless-lan.mo": content}
+        return {f"{CATALOGUES}/{SPOKEN[language]}/LC_MESSAGES/wireless-lan.mo": content}
     if language == "long":
         toolkit = subprocess.run(["msgunfmt", "/usr/share/locale/de/LC_MESSAGES/gtk20.mo"],
                                  check=True, stdout=subprocess.PIPE, encoding="utf-8").stdout
         stock = re.findall(r'^msgctxt "(Stock label)"\nmsgid "(.+)"$', toolkit, re.M)
-        return {"/share/locale/xx/LC_MESSAGES/wireless-lan.mo":
+        return {f"{CATALOGUES}/xx/LC_MESSAGES/wireless-lan.mo":
                 _catalogue((context, text, _twice(text)) for context, text in own),
                 "/usr/share/locale/xx/LC_MESSAGES/gtk20.mo":
                 _catalogue((context, text, _twice(text)) for context, text in stock)}

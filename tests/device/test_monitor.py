@@ -5,6 +5,7 @@ import subprocess
 
 from connecting import (ACQUIRING, CONNECTING, IDLE, INVALID, LOCKED, address_of, connect,
                         connected, idle, pass_time, poll_address, poll_link, settle, wait_commands)
+from harness import CATALOGUES
 
 ZEROS = "00:00:00:00:00:00"
 
@@ -223,7 +224,7 @@ def catalogue(directory):
     done = subprocess.run(["msgfmt", "-o", "-", "-"], input=source.encode(), cwd=directory,
                           check=True,
                           stdout=subprocess.PIPE)
-    return {"/share/locale/de/LC_MESSAGES/wireless-lan.mo": done.stdout}
+    return {f"{CATALOGUES}/de/LC_MESSAGES/wireless-lan.mo": done.stdout}
 
 
 def test_texts_are_translated_but_for_one(device, german, tmp_path):

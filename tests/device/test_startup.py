@@ -7,8 +7,7 @@ import subprocess
 
 import pytest
 
-from harness import wait_until
-from harness import TOP
+from harness import CATALOGUES, TOP, wait_until
 
 BUTTONS = {
     "button-refresh": ("gtk-refresh", 1),
@@ -210,7 +209,7 @@ def test_translated_texts(device, german):
     catalogue = subprocess.run(["msgfmt", "-o", "-", f"{TOP}/po/de.po"], check=True,
                                stdout=subprocess.PIPE).stdout
     translated = gettext.GNUTranslations(io.BytesIO(catalogue)).gettext
-    d = device("connected", files={"/share/locale/de/LC_MESSAGES/wireless-lan.mo": catalogue})
+    d = device("connected", files={f"{CATALOGUES}/de/LC_MESSAGES/wireless-lan.mo": catalogue})
     d.dissociate()
     app = d.start(environment=german)
     app.wait_title(translated("Wireless network selection"))

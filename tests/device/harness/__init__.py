@@ -3,6 +3,6 @@
 
 from probe import wait_until
 
-from .device import TOP, Device
+from .device import CATALOGUES, TOP, Device
 
-__all__ = ["Device", "TOP", "wait_until"]
+__all__ = ["CATALOGUES", "Device", "TOP", "wait_until"]

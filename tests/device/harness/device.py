@@ -18,6 +18,9 @@ from .display import Display
 
 TOP = os.path.dirname(os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__)))))
 
+# Where the program looks for its message catalogues.
+CATALOGUES = os.environ.get("WIRELESS_LAN_LOCALEDIR", "/share/locale")
+
 # What a healthy program never prints.
 COMPLAINT = re.compile(
     r"^(?:.*(?:-WARNING|-CRITICAL|-ERROR) \*\*:.*|.*(?:AddressSanitizer|LeakSanitizer|"
@@ -117,7 +120,8 @@ class Device:
         program = os.path.abspath(os.environ.get("WIRELESS_LAN",
                                                  f"{build}/wireless-lan/wireless-lan"))
         if device_path:
-            program = f"{build}/tests/with-device-path"
+            program = os.environ.get("WIRELESS_LAN_WITH_DEVICE_PATH",
+                                     f"{build}/tests/with-device-path")
         assert os.path.exists(program), f"{program} is not built"
         settings = {
             "DISPLAY": self.display.name, "HOME": "/device/state/home", "LANG": "C.UTF-8",
