@@ -535,6 +535,17 @@ def test_event_that_decides_nothing_yet(event, word):
     assert alive(late)
 
 
+def test_open_network_that_is_out_of_reach():
+    """It is not waited for, but whoever waits finds the reason before the watch is over."""
+    note("status", "wpa_state=SCANNING\n")
+    assert joining.iwset("Nowhere") == (0, b"", b"")
+    assert wait_for(lambda: reason() == b"not-found\n")
+    assert followers()
+    joining.event(f"CTRL-EVENT-CONNECTED - Connection to {BSS} completed [id=0 id_str=]")
+    assert wait_for(lambda: not followers())
+    assert reason() == b""
+
+
 def test_follower_waits_for_its_turn():
     """It must not end what another command has just begun."""
     note("status", "wpa_state=AUTHENTICATING\n")
