@@ -6,6 +6,7 @@
 #   security    open, wep or wpa
 #   key, index, encryption   the key, which of the four WEP keys it is, and open or restricted
 #   adhoc       yes for a network of equals
+#   hosts       yes where an open network of equals is made here, whoever else has one
 #   ap          yes where an access point of our own stands in for a network of equals
 #   offered     what the supplicant can do; nothing else is asked of it
 # shellcheck disable=SC2154
@@ -241,6 +242,8 @@ network_block() {
         # Channel 1 is where the network is made when nobody else has made it yet.
         [ "${ap-}" = yes ] && echo 'mode=2' || echo 'mode=1'
         echo 'frequency=2412'
+        # To look for it on all channels first takes longer than a caller waits.
+        [ "${hosts-}:$security" != yes:open ] || echo 'scan_freq=2412'
     fi
     case $security in
     open) echo 'key_mgmt=NONE' ;;

@@ -64,8 +64,8 @@ def start_of_the_machine(net, what, *tracer):
     air.start(*tracer, "wireless-lan-auto", "--daemon", "wlan0")
     wait_until(lambda: address() == net, lambda: f"an address of {net}, there is {address()}", 300)
     now = uptime()
-    print(f"auto: {what}: an address {now:.1f} s after power-on, {now - begun:.1f} s after the start "
-          f"of the automatic, {now - supplicant()[1]:.1f} s after that of the supplicant")
+    print(f"auto: {what}: an address {now - begun:.1f} s after the start of the automatic, "
+          f"{now - supplicant()[1]:.1f} s after that of the supplicant")
 
 
 def end_of_the_machine():
