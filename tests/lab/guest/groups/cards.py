@@ -139,8 +139,8 @@ def a_driver_without_ad_hoc_hosts_as_an_access_point():
     wait_until(lambda: "type AP" in run("iw", "dev", "wlan0", "info"), "the access point")
     w.photograph("hosting")
     run("ip", "link", "set", "wlan3", "up", netns=FAR)
-    wait_until(lambda: re.search(r"SSID: Our own", run("iw", "dev", "wlan3", "scan", netns=FAR,
-                                                       check=False)), "a second station sees it", 90)
+    wait_until(lambda: "SSID: Our own" in run("iw", "dev", "wlan3", "scan", netns=FAR,
+                                              check=False), "a second station sees it", 90)
     run("iw", "dev", "wlan3", "connect", "Our own", netns=FAR)
     wait_until(lambda: "Connected to" in run("iw", "dev", "wlan3", "link", netns=FAR),
                "the second station is in")

@@ -32,7 +32,8 @@ def prepare():
     run("/lib/systemd/systemd-udevd", "--daemon")
     run("udevadm", "trigger", "--action=add")
     run("udevadm", "settle", "--timeout=60")
-    start("wpa_supplicant", "-u", "-O", "DIR=/run/wpa_supplicant GROUP=netdev", log="supplicant.log")
+    start("wpa_supplicant", "-u", "-O", "DIR=/run/wpa_supplicant GROUP=netdev",
+          log="supplicant.log")
     start("NetworkManager", "--no-daemon", log="NetworkManager.log")
     wait_until(lambda: managed("wlan0") and managed("wlan1"), told, 120)
 
