@@ -49,8 +49,8 @@ static void get_size(GtkCellRenderer *renderer, GtkWidget *view, GdkRectangle *a
                      gint *y, gint *width, gint *height)
 {
     const auto *parent = GTK_CELL_RENDERER_CLASS(row_text_parent_class);
-    SizeOfText *slot =
-        area == nullptr ? slot_of(reinterpret_cast<RowText *>(renderer), view) : nullptr;
+    gpointer row = renderer; // an object is aligned for every type
+    SizeOfText *slot = area == nullptr ? slot_of(static_cast<RowText *>(row), view) : nullptr;
     gint wide, high;
 
     if (slot == nullptr) {
