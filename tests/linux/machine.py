@@ -88,7 +88,7 @@ def set_up():
     sh("mount", "--bind", "/usr/sbin", real)
     for name in os.listdir(real):
         if name not in CLIENTS:
-            os.symlink(os.path.join(real, name), os.path.join(tools, name))
+            os.symlink(real_tool(name), os.path.join(tools, name))
     sh("mount", "--bind", tools, "/usr/sbin")
     sh("mount", "-t", "tmpfs", "none", CHOSEN)
     os.environ["PATH"] = "/usr/sbin:/usr/bin:/sbin:/bin"  # the tests themselves meet no stub
@@ -106,7 +106,7 @@ def tear_down():
     it is taken off with all that is mounted there."""
     clean()
     os.chdir("/")
-    subprocess.run(["umount", "-R", "-l", ROOT], check=False)
+    subprocess.run(["umount", "-l", ROOT], check=True)
     os.rmdir(ROOT)
 
 
@@ -134,13 +134,22 @@ def clean():
             os.remove(path)
     while _hidden:
         name = _hidden.pop()
-        os.symlink(os.path.join(real_sbin(), name), f"/usr/sbin/{name}")
+        os.symlink(real_tool(name), f"/usr/sbin/{name}")
     choose()
 
 
 def real_sbin():
     """Where the machine's own /usr/sbin is found."""
     return os.path.join(ROOT, "real-sbin")
+
+
+def real_tool(name):
+    """Where a tool of the machine's own /usr/sbin is. A link there may lead to a neighbouring
+    directory, ../bin/busybox, from where it was."""
+    path = os.path.join(real_sbin(), name)
+    if os.path.islink(path):
+        return os.path.normpath(os.path.join("/usr/sbin", os.readlink(path)))
+    return path
 
 
 def awk_directory(name):

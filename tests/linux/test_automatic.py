@@ -372,7 +372,7 @@ def test_a_new_list_while_it_searches():
     begin(HOME, MARKET)
     save(MARKET, HOME)
     assert wait_for(reconfigured)
-    assert names() == ["Market", "Home"]
+    assert wait_for(lambda: names() == ["Market", "Home"])
     assert len(supplicants()) == 1
 
 
@@ -386,7 +386,7 @@ def test_a_new_list_does_not_touch_a_connection_that_it_holds():
     joining.note("status", SEARCHING)
     action("DISCONNECTED")
     assert wait_for(reconfigured)
-    assert names() == ["Old School", "Market"]
+    assert wait_for(lambda: names() == ["Old School", "Market"])
 
 
 @pytest.mark.parametrize("new", [(HOME,), (HOME, MARKET.replace("off", "open").replace(
