@@ -17,22 +17,37 @@ stop_client() {
     fi
 }
 
+# has_address: whether the interface has an address that others can reach.
+has_address() {
+    [ -n "$(ip -4 -o address show dev "$interface" scope global 2>/dev/null)" ]
+}
+
+# while_for TENTHS COMMAND...: waits while the command succeeds, so many tenths of a second at most.
+while_for() {
+    tries=$1
+    shift
+    while [ "$tries" -gt 0 ] && "$@"; do
+        pause 0.1
+        tries=$((tries - 1))
+    done
+}
+
 # release_lease: gives the lease back while the network is there.
 release_lease() {
     runs dhcp.pid || return 0
     client=
     { read -r client <"/proc/$pid/comm"; } 2>/dev/null
     case $client in
-    # It sends the message and goes on waiting.
-    udhcpc | busybox) kill -USR2 "$pid" 2>/dev/null ;;
+    # It sends the message, takes the address off and goes on waiting. A further signal before that
+    # would take the first one's place.
+    udhcpc | busybox)
+        kill -USR2 "$pid" 2>/dev/null
+        while_for 20 has_address
+        ;;
     # It leaves after the message.
     dhcpcd)
         kill -ALRM "$pid" 2>/dev/null
-        tries=100
-        while [ "$tries" -gt 0 ] && runs dhcp.pid; do
-            sleep 0.1
-            tries=$((tries - 1))
-        done
+        while_for 100 runs dhcp.pid
         ;;
     dhclient)
         limited 10 dhclient -4 -r -lf "$state/dhclient.leases" -pf "$state/dhclient.pid" \
