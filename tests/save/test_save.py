@@ -105,12 +105,14 @@ def test_killed_at_every_system_call(kind, scene, tmp_path, texts, capsys):
     for name, number in calls:
         path, target = prepare(directory, scene, kind, texts)
         status, _ = save(kind, path, version, inject(f"{name}:signal=KILL:when={number}"))
-        if status == 0 and name == "exit_group":
-            status = -signal.SIGKILL
-        assert status in (-signal.SIGKILL, 128 + signal.SIGKILL), (name, number)
+        killed = status in (-signal.SIGKILL, 128 + signal.SIGKILL)
+        # exit_group itself; and a sanitizer maps memory once more or less from run to run, so that
+        # the last call of a kind may not come.
+        assert killed or status == 0, (name, number)
         found = target.read_bytes() if target.exists() else None
-        assert found in (before, texts[kind, version]), (name, number)
+        assert found == texts[kind, version] or killed and found == before, (name, number)
         outcome["old" if found == before else "new"] += 1
+        outcome["survived"] += not killed
         if found is not None:
             mode = stat.S_IMODE(target.stat().st_mode)
             assert mode == (0o600 if before is None else 0o640), (name, number)
@@ -120,6 +122,7 @@ def test_killed_at_every_system_call(kind, scene, tmp_path, texts, capsys):
         print(f"\n{kind}, {scene}: killed at {len(calls)} system calls, file whole each time "
               f"(old {outcome['old']}, new {outcome['new']})", end=" ")
     assert outcome["old"] > 5 and outcome["new"] > 0
+    assert outcome["survived"] <= 1 + len(calls) // 50
 
 
 FAULTS = {
