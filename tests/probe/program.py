@@ -385,10 +385,15 @@ class Program(Pane):
                 (text is None or any(one.get("text") == text for one in window.walk()
                                      if one["visible"]))
         pane = Pane(self, f"dialog {title or text!r}", choose).wait(limit)
+
+        def in_front():
+            # It may have gone again.
+            window = pane.now()
+            return window is None or window["active"] or \
+                self.props(window)["properties"]["type"] == "popup"
+
         if self.window_manager:  # and in front, with the keys
-            wait_until(lambda: (pane.now() or {"active": True})["active"] or
-                       self.props(pane.tree())["properties"]["type"] == "popup",
-                       lambda: f"the focus of {pane.description}\n{self.sketch()}", limit)
+            wait_until(in_front, lambda: f"the focus of {pane.description}\n{self.sketch()}", limit)
         return pane
 
     def window(self, identity):
