@@ -38,24 +38,27 @@ def fixture_street(shared_device):
     return d
 
 
-def picture(d):
-    """What the screen shows, as text that can be compared."""
+def picture(d, app):
+    """What the window shows, as text that can be compared: without the frame, which the window
+    manager draws when it comes to it."""
     path = d.display.screenshot(f"{d.state}/screen.png")
-    return subprocess.run(["identify", "-quiet", "-format", "%#", path], check=True,
+    x, y, width, height = app.tree()["rect"]
+    return subprocess.run(["identify", "-quiet", "-format", "%#",
+                           f"{path}[{width}x{height}+{x}+{y}]"], check=True,
                           stdout=subprocess.PIPE, text=True).stdout
 
 
 def settled_picture(d, app, known=None):
     """The picture once the list is filled: `known`, or with none the first that stays."""
     app.wait_listed()
-    app.text("title-label")
+    wait_until(lambda: app.tree()["active"], "the window manager to show the window")
     if known is not None:
-        wait_until(lambda: picture(d) == known, lambda: "the same picture")
+        wait_until(lambda: picture(d, app) == known, lambda: "the same picture")
         return known
     last = [None]
 
     def stays():
-        before, last[0] = last[0], picture(d)
+        before, last[0] = last[0], picture(d, app)
         return before == last[0]
     wait_until(stays, "the picture to stay")
     return last[0]
@@ -66,8 +69,6 @@ def environment(data, rc):
     return {"ASAN_OPTIONS": os.environ.get("ASAN_OPTIONS", "") + ":detect_leaks=0",
             "XDG_DATA_DIRS": data, "XDG_DATA_HOME": "/nowhere",
             "GTK2_RC_FILES": "/dev/null" if rc is None else f"/device/state/{rc}.rc"}
-
-
 
 
 @pytest.mark.parametrize("data, rc", [

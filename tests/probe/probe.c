@@ -2,7 +2,7 @@
 // Looks at the real program's widgets from outside: a GTK+ module that answers questions on a
 // socket, from the program's own main loop (nested ones of dialogs too). It changes nothing, and
 // answers only when the program has nothing more urgent to do: events handled, sizes settled, idle
-// jobs done, all drawn.
+// jobs done, all drawn, and that by the X server too.
 //
 // One question a line, one JSON value a line back. Bytes of texts are written as U+0000 to U+00FF.
 //   tree             every top-level window with all that is in it
@@ -480,6 +480,9 @@ static gboolean cb_question(GIOChannel *channel, GIOCondition condition, gpointe
     char block[512];
     char *end;
     (void)condition;
+    gdk_flush();
+    if (gdk_events_pending())
+        return TRUE;
     int fd = g_io_channel_unix_get_fd(channel);
     ssize_t got = recv(fd, block, sizeof block, 0);
     gboolean open = got > 0;
