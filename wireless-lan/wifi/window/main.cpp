@@ -90,7 +90,12 @@ int main(int argc, char **argv)
     bindtextdomain(TEXT_DOMAIN, PROGRAM_LOCALEDIR);
     textdomain(TEXT_DOMAIN);
     bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
+    // Its thread reads the font configuration while the display is opened and the device asked.
+    pango_cairo_font_map_get_default();
     gtk_init(&argc, &argv);
+    // Its thread reads the font configuration, the longest piece of the start, while the device is
+    // asked.
+    pango_cairo_font_map_get_default();
     use_built_in_icons();
     if (!my_wifi_init()) {
         debug_line("my_wifi_init error!!!\r");
