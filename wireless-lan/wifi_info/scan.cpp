@@ -198,6 +198,8 @@ void get_cell(WIFI_INTERFACE *iface)
         perror("pipe");
         return;
     }
+    collect_debug_lines();
     read_cells(pipe);
+    write_debug_lines();
     pclose(pipe);
 }
