@@ -5,6 +5,9 @@
 #include <cstring>
 
 #include <glib/gi18n.h>
+#ifdef HAVE_MALLOC_TRIM
+#include <malloc.h>
+#endif
 
 #include "base/controls.h"
 #include "base/desktop.h"
@@ -62,6 +65,15 @@ static void match_access_point(const WIFI_INTERFACE *iface, char *status, gsize 
         copy_field(status, size, _("Disconnect"));
 }
 
+// What the start and the scan have freed goes back to the system once the list is drawn.
+static gboolean cb_drawn(gpointer)
+{
+#ifdef HAVE_MALLOC_TRIM
+    malloc_trim(0);
+#endif
+    return FALSE;
+}
+
 // One-shot timer: scans and fills the list. Always FALSE.
 static gboolean cb_refresh(gpointer)
 {
@@ -98,6 +110,7 @@ static gboolean cb_refresh(gpointer)
     match_access_point(iface, status, sizeof status);
     review_tree_vanpro(status);
     set_title_label(_("Wireless network selection"));
+    g_idle_add_full(G_PRIORITY_LOW, cb_drawn, nullptr, nullptr);
     return FALSE;
 }
 
