@@ -38,10 +38,10 @@ static gboolean read_cardinals(GdkScreen *screen, const char *name, glong offset
     if (!gdk_x11_screen_supports_net_wm_hint(screen, gdk_atom_intern(name, FALSE)))
         return FALSE;
 
-    const int status = XGetWindowProperty(
-        display, GDK_WINDOW_XID(gdk_screen_get_root_window(screen)),
-        gdk_x11_get_xatom_by_name_for_display(gdk_screen_get_display(screen), name), offset, count,
-        False, XA_CARDINAL, &type, &format, &items, &rest, &data);
+    const int status =
+        XGetWindowProperty(display, GDK_WINDOW_XID(gdk_screen_get_root_window(screen)),
+                           gdk_x11_get_xatom_by_name(name), offset, count, False, XA_CARDINAL,
+                           &type, &format, &items, &rest, &data);
     const gboolean whole = status == Success && type == XA_CARDINAL && format == 32 &&
                            items == static_cast<unsigned long>(count);
 
@@ -334,7 +334,7 @@ static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *, gpointer)
 // A window manager may report the frame only after it has shown the window.
 static gboolean cb_property(GtkWidget *window, GdkEventProperty *event, gpointer)
 {
-    if (event->atom == gdk_atom_intern_static_string("_NET_FRAME_EXTENTS"))
+    if (event->atom == gdk_atom_intern("_NET_FRAME_EXTENTS", FALSE))
         fit_size(window);
     return FALSE;
 }
