@@ -11,8 +11,7 @@ static gint wanted_width(GtkTreeViewColumn *column)
     return MAX(column->requested_width, column->button_request);
 }
 
-// The name gives up what the other columns need. A width that
-// the user has set stays.
+// The name gives up what the other columns need. A width that the user has set stays.
 static void cb_room_changed(GtkWidget *viewport, GtkAllocation *room, gpointer data)
 {
     GtkTreeView *view = GTK_TREE_VIEW(data);
