@@ -14,14 +14,12 @@ note_taken() {
 # of another network cannot hold this one.
 look_around() {
     others=
-    ours=$(readlink /proc/self/ns/net)
     for process in /proc/[0-9]*; do
         name=
         { read -r name <"$process/comm"; } 2>/dev/null
         case $name in
         dhclient | dhcpcd | hostapd | iwd | systemd-network | udhcpc)
-            [ "$(readlink "$process/ns/net")" != "$ours" ] ||
-                others="$others $name:${process#/proc/}"
+            ! shares_network "$process" || others="$others $name:${process#/proc/}"
             ;;
         esac
     done

@@ -235,14 +235,21 @@ stop_process() {
     rm -f "$state/$1"
 }
 
+# shares_network DIRECTORY: whether the process that has this directory under /proc is in our network.
+# An interface has its name in one network namespace: the processes of others are of another machine.
+# To read ns/net takes the right to trace the process, which the systemd unit does not have.
+shares_network() {
+    # shellcheck disable=SC3013 # all of our shells know it
+    [ "$1/net/dev" -ef /proc/self/net/dev ]
+}
+
 # processes NAME WORD: prints the numbers of the processes of this name that have WORD among their
-# arguments. An interface has its name in one network namespace: others are of another machine.
+# arguments.
 processes() {
     for entry in /proc/[0-9]*; do
         { read -r comm <"$entry/comm"; } 2>/dev/null || continue
         [ "$comm" = "$1" ] || continue
-        # shellcheck disable=SC3013 # all of our shells know it
-        [ "$entry/ns/net" -ef "/proc/$$/ns/net" ] || continue
+        shares_network "$entry" || continue
         ! tr '\000' '\n' <"$entry/cmdline" 2>/dev/null | grep -qxF -e "$2" || echo "${entry##*/}"
     done
 }

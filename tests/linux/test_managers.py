@@ -86,8 +86,9 @@ def test_supplicant_of_two_cards_that_cannot_be_asked(other_supplicant):
 
 def begin(name, *words):
     install(name)
-    subprocess.Popen([f"{machine.CHOSEN}/{name}", *words], env=machine.environment())
+    holder = subprocess.Popen([f"{machine.CHOSEN}/{name}", *words], env=machine.environment())
     assert wait_for(lambda: calls(name))
+    return holder
 
 
 @pytest.mark.parametrize("words, status", [
@@ -98,6 +99,17 @@ def test_iwd(words, status):
     assert done[0] == status
     assert done[2] == (b"lnk-ifup: iwd holds wlan0: stop it, or start it with -I wlan0\n"
                        if status else b"")
+
+
+@pytest.mark.parametrize("find", ["look_around; echo $others",
+                                  "for pid in $(processes iwd wlan0); do echo iwd:$pid; done"])
+def test_found_without_the_right_to_trace(find):
+    """The systemd unit has fewer rights than those who hold the interface."""
+    holder = begin("iwd", "-i", "wlan0")
+    text = f'set -u; library={machine.DEVICE}/wireless-lan.sh; . "$library"; {find}'
+    found = subprocess.run(["setpriv", "--bounding-set=-sys_ptrace", "sh", "-c", text],
+                           stdout=subprocess.PIPE, env=machine.environment(), check=True).stdout
+    assert found == b"iwd:%d\n" % holder.pid
 
 
 def test_iwd_does_not_keep_ours_on_the_interface():
