@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: MIT
-"""Simulated radios that come and go: what mac80211_hwsim is told through generic netlink
-(linux/drivers/net/wireless/virtual/mac80211_hwsim.h)."""
+"""Simulated radios that come and go: the requests for them are sent to mac80211_hwsim over generic
+netlink (linux/drivers/net/wireless/virtual/mac80211_hwsim.h)."""
 
 import os
 import socket
