@@ -32,6 +32,7 @@ def printed_since(app, mark):
 
 def mark(app):
     """Forgets the commands; gives how far the output is and the states sent so far."""
+    app.tree()  # answered when nothing is left to do
     app.device.clear_commands()
     return len(app.stdout()), len(app.stderr()), app.device.states()
 

@@ -27,6 +27,9 @@ class Screen:
     # too late, as it would be by looking at a property after the news that it changed.
     def _listen(self):
         self._changes, self._atoms = [], {}
+        # A property of a window of our own counts what the ear has been asked to catch up with.
+        self._asked = self._caught_up = 0
+        self._own = self.root.create_window(-1, -1, 1, 1, 0, X.CopyFromParent)
         self._ear = xdisplay.Display(self.name)
         self._context = self._x.record_create_context(
             0, [record.AllClients],
@@ -58,7 +61,9 @@ class Screen:
             if opcode != CHANGE_PROPERTY or length < 24:
                 return
             window = int.from_bytes(data[4:8], "little")
-            if window == self.root.id:
+            if window == self._own.id:
+                self._caught_up = int.from_bytes(data[24:28], "little")
+            elif window == self.root.id:
                 self._changes.append((
                     int.from_bytes(data[8:12], "little"), int.from_bytes(data[12:16], "little"),
                     data[16], mode,
@@ -66,7 +71,12 @@ class Screen:
             data = data[length:]
 
     def root_changes(self):
-        """(name, type, format, mode, value) of every change of a root window property, in order."""
+        """(name, type, format, mode, value) of every change of a root window property that the
+        server has been asked for so far, in order."""
+        self._asked += 1
+        self._own.change_property(Xatom.INTEGER, Xatom.INTEGER, 32, [self._asked])
+        self._x.sync()
+        wait_until(lambda: self._caught_up == self._asked, "the ear to hear what was said")
         changes = list(self._changes)
         for change in changes:
             if change[0] not in self._atoms:
@@ -196,6 +206,12 @@ class Screen:
         window = wait_until(lambda: self._window(self.root, title), f"a window {title!r}")
         window.configure(**size)
         self._x.sync()
+
+    def window_size(self, title):
+        """Its width and height, as the words of a command."""
+        geometry = wait_until(lambda: self._window(self.root, title),
+                              f"a window {title!r}").get_geometry()
+        return f"{geometry.width} {geometry.height}"
 
     def _window(self, window, title):
         """The window with that title which the window manager has taken in."""
