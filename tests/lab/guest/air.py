@@ -113,9 +113,10 @@ def switch_off(radio):
     _hostapd[radio].wait()
 
 
-def addresses(*nets):
-    """Start the DHCP server for the given subnets. Return the process."""
+def addresses(*nets, more=()):
+    """Start the DHCP server for the given subnets, with MORE options. Return the process."""
     options = ["--no-daemon", "--conf-file=/dev/null", "--port=0", "--bind-dynamic",
                "--no-ping", "--leasefile-ro", "--user=root"]
     options += [f"--dhcp-range=10.9.{net}.100,10.9.{net}.150,255.255.255.0,1h" for net in nets]
+    options += more
     return start("dnsmasq", *options, netns=AIR, log="dnsmasq.log")

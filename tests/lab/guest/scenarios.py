@@ -3,10 +3,14 @@
 
 Every scenario is one function; its name, with blanks, is the name of the test. A group shares one
 machine and one run of the program; its function "prepare" prepares the air. A result is one line of
-the file "results": "ok NAME" or "not ok NAME: reason"."""
+the file "results": "ok NAME" or "not ok NAME: reason".
+
+A group that cuts the power (BOOTS) has a list of scenarios for each start of the machine; all but
+the last end with a cut."""
 
 import faulthandler
 import importlib
+import os
 import sys
 import time
 import traceback
@@ -15,6 +19,12 @@ import air
 import window as w
 from air import run
 from probe import wait_until
+
+SYSTEMD = os.path.isdir("/run/systemd/system")
+
+
+def journal():
+    return run("journalctl", "-b", "--no-pager", "-o", "short-monotonic")
 
 
 def look(name):
@@ -25,6 +35,8 @@ def look(name):
                         ("ip", "route"), ("ps", "-ef"), ("cat", "/proc/net/wireless"),
                         ("cat", "/etc/wireless.conf"), ("dmesg",)):
             file.write(f"$ {' '.join(command)}\n{run(*command, check=False)}\n")
+        if SYSTEMD:
+            file.write(journal())
 
 
 def recover():
@@ -42,11 +54,27 @@ def recover():
                "the window to be idle", 100)
 
 
+def cut_the_power():
+    """Ends the machine between two instructions. What it has not written to its disk is lost."""
+    with open("/proc/uptime") as file:
+        uptime = file.read().split()[0]
+    with open("/dev/console", "w") as file:
+        file.write(f"lab: the power is cut after {uptime} s\n")
+    with open("/proc/sysrq-trigger", "w") as file:
+        file.write("b")
+
+
 def main():
     wanted = sys.argv[1]
     only = sys.argv[2:]
     group = importlib.import_module(f"groups.{wanted}")
-    names = [scenario.__name__ for scenario in group.SCENARIOS]
+    scenarios = group.SCENARIOS
+    boots = getattr(group, "BOOTS", 0)
+    if boots:
+        with open("/lab/boot") as file:
+            boot = int(file.read())
+        scenarios = scenarios[boot - 1]
+    names = [scenario.__name__ for scenario in scenarios]
     results = open(f"{air.LOGS}/results", "a", buffering=1)
     # Where it hangs, if it hangs, is in console.log.
     faulthandler.dump_traceback_later(200, repeat=True)
@@ -60,7 +88,7 @@ def main():
         look(wanted)
         return
     print(f"{wanted}: prepared after {time.monotonic() - begun:.0f} s")
-    for scenario in group.SCENARIOS:
+    for scenario in scenarios:
         name = scenario.__name__
         if only and name not in only:
             continue
@@ -82,6 +110,11 @@ def main():
                 recover()
             except Exception:
                 traceback.print_exc()
+    if boots:
+        with open(f"{air.LOGS}/journal-{boot}.log", "w") as file:
+            file.write(journal())
+        if boot < boots:
+            cut_the_power()
 
 
 if __name__ == "__main__":
