@@ -1,6 +1,6 @@
 # SPDX-License-Identifier: MIT
-"""The ears of assistive technology: a bus of its own (AT-SPI) on the screen of a simulated device,
-and on it what a screen reader asks. Nothing is found by its widget, its place or a pointer."""
+"""The ears of assistive technology: a bus of its own (AT-SPI) on the screen of a device, and on it
+what a screen reader asks. Nothing is found by its widget, its place or a pointer."""
 
 import contextlib
 import os
@@ -8,7 +8,7 @@ import subprocess
 
 import gi
 
-from harness import wait_until
+from probe import wait_until
 
 gi.require_version("Atspi", "2.0")
 from gi.repository import Atspi, GLib  # pylint: disable=wrong-import-position
@@ -67,6 +67,7 @@ class Reader:
     """One for a test process: its AT-SPI client knows one bus."""
 
     def __init__(self, device):
+        """`device`: its `display`, and its directory `state`, where the probe is."""
         self.device = device
         self.heard = []
         self._processes = []

@@ -18,13 +18,13 @@ app = None  # the running program, and its main window
 _told = 0  # how many of the desktop's notices have been looked at
 
 
-def begin():
-    """Starts the program; returns when its window shows."""
+def begin(more=None):
+    """Starts the program, with MORE in its environment; returns when its window shows."""
     global screen, app
     screen = screen or Screen(os.environ["DISPLAY"])
-    environment = dict(os.environ, GTK_MODULES="/lab/probe.so", PROBE_SOCKET=SOCKET,
-                       ASAN_OPTIONS="detect_leaks=0:verify_asan_link_order=0",
-                       UBSAN_OPTIONS="print_stacktrace=1")
+    environment = {**os.environ, "GTK_MODULES": "/lab/probe.so", "PROBE_SOCKET": SOCKET,
+                   "ASAN_OPTIONS": "detect_leaks=0:verify_asan_link_order=0",
+                   "UBSAN_OPTIONS": "print_stacktrace=1", **(more or {})}
     notices()
     app = Program(start("/lab/wireless-lan", log="program.log", env=environment), SOCKET, screen)
     app.wait(120)
