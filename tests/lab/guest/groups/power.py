@@ -309,6 +309,15 @@ def the_hosted_network_is_back():
     same(complaints(), [], "the complaints in the journal")
 
 
+def removed_it_leaves_nothing():
+    removal = ("/usr/bin/dpkg", "-r", "wireless-lan", "wireless-lan-linux")
+    said = run(*removal) if os.path.isdir("/lab/packages") else run("sh", "/lab/prerm", "remove")
+    check("Glob" not in said and "ailed" not in said, f"it says {said}")
+    same(glob.glob("/etc/systemd/system/*.wants/wireless-lan*"), [], "the links to the unit")
+    same((shown("ActiveState"), ours_left(), addresses()), ("inactive", [], []), "what is left")
+    check("ssid" not in run("iw", "dev", "wlan0", "info"), "the hosted network is there")
+
+
 SCENARIOS = [
     [
         the_package_has_switched_it_on,
@@ -332,5 +341,6 @@ SCENARIOS = [
     ],
     [
         the_hosted_network_is_back,
+        removed_it_leaves_nothing,
     ],
 ]
