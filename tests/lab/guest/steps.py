@@ -4,7 +4,7 @@
 import re
 
 import window as w
-from air import run
+from air import FAR, run
 from probe import wait_until
 
 
@@ -135,3 +135,22 @@ def host(name, *addresses):
     box.press("gtk-ok")
     box.wait_gone()
     wait_until(lambda: w.title() == "Ad-Hoc Host Mode", "the title says so")
+
+
+def second_station(card, name, net):
+    """A station far away sees the network of equals of this name, joins it and reaches us."""
+    run("ip", "link", "set", card, "up", netns=FAR)
+
+    def seen():
+        found = run("iw", "dev", card, "scan", netns=FAR, check=False)
+        return f"SSID: {name}" in found and "IBSS" in found
+
+    wait_until(seen, "a second station to see it", 90)
+    run("ip", "link", "set", card, "down", netns=FAR)
+    run("iw", "dev", card, "set", "type", "ibss", netns=FAR)
+    run("ip", "link", "set", card, "up", netns=FAR)
+    frequency = re.search(r"channel \d+ \((\d+) MHz", run("iw", "dev", "wlan0", "info")).group(1)
+    run("iw", "dev", card, "ibss", "join", name, frequency, netns=FAR)
+    run("ip", "addr", "add", f"10.9.{net}.2/24", "dev", card, netns=FAR)
+    wait_until(lambda: "1 received" in run("ping", "-c", "1", "-W", "2", f"10.9.{net}.1", netns=FAR,
+                                           check=False), "an answer to ping", 60)

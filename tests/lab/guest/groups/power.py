@@ -14,10 +14,11 @@ import time
 import air
 import hwsim
 import window as w
-from air import FAR, network, run, start
+from air import network, run, start
 from commands import addresses, supplicant
 from probe import wait_until
-from steps import check, connected_to, host, linked, press_button, same, write_preferred
+from steps import (check, connected_to, host, linked, press_button, same, second_station,
+                   write_preferred)
 
 PACKAGES = "systemd-sysv udev dbus dhcpcd-base isc-dhcp-client"
 INIT = "/lib/systemd/systemd"
@@ -300,12 +301,7 @@ def the_hosted_network_is_back():
     told = run("iw", "dev", "wlan0", "info")
     check("ssid Our own\n" in told and "type IBSS\n" in told, told)
     times("power-on, hosting")
-    run("iw", "dev", "wlan3", "set", "type", "ibss", netns=FAR)
-    run("ip", "link", "set", "wlan3", "up", netns=FAR)
-    run("iw", "dev", "wlan3", "ibss", "join", "Our own", "2412", netns=FAR)
-    run("ip", "addr", "add", "10.9.77.2/24", "dev", "wlan3", netns=FAR)
-    wait_until(lambda: "1 received" in run("ping", "-c", "1", "-W", "2", "10.9.77.1", netns=FAR,
-                                           check=False), "an answer to ping", 60)
+    second_station("wlan3", "Our own", 77)
     same(complaints(), [], "the complaints in the journal")
 
 

@@ -1,14 +1,12 @@
 # SPDX-License-Identifier: MIT
 """Addresses by hand, a network of one's own."""
 
-import re
-
 import air
 import window as w
 from air import FAR, network, run
 from probe import wait_until
 from steps import (check, connected_to, followed, host, open_settings, press_button, press_connect,
-                   same, tick, wanted_row, write_addresses)
+                   same, second_station, tick, wanted_row, write_addresses)
 
 
 def prepare():
@@ -83,22 +81,7 @@ def a_hosted_network_is_seen_and_joined_by_a_second_station():
     followed("3")
     check(not w.app.find("button-connect")["usable"], "Connect is sensitive")
     w.photograph("hosting")
-    run("ip", "link", "set", "wlan2", "up", netns=FAR)
-
-    def seen():
-        found = run("iw", "dev", "wlan2", "scan", netns=FAR, check=False)
-        return any("SSID: Our own" in one and "IBSS" in one for one in found.split("BSS ")) or \
-            ("SSID: Our own" in found and "IBSS" in found)
-
-    wait_until(seen, "a second station sees it", 90)
-    run("ip", "link", "set", "wlan2", "down", netns=FAR)
-    run("iw", "dev", "wlan2", "set", "type", "ibss", netns=FAR)
-    run("ip", "link", "set", "wlan2", "up", netns=FAR)
-    frequency = re.search(r"channel \d+ \((\d+) MHz", run("iw", "dev", "wlan0", "info")).group(1)
-    run("iw", "dev", "wlan2", "ibss", "join", "Our own", frequency, netns=FAR)
-    run("ip", "addr", "add", "10.9.77.2/24", "dev", "wlan2", netns=FAR)
-    wait_until(lambda: "1 received" in run("ping", "-c", "1", "-W", "2", "10.9.77.1", netns=FAR,
-                                           check=False), "an answer to ping")
+    second_station("wlan2", "Our own", 77)
 
 
 def from_hosting_back_to_a_network():
