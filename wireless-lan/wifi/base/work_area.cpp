@@ -12,7 +12,7 @@
 // window opens as large as the work area; one that asks for less may be made to fit by its frame.
 constexpr gint FRAME_ALLOWANCE = 64;
 
-constexpr gint MAX_TRIES = 5;
+constexpr gint MAX_TRIES = 20;
 
 constexpr char KEPT_KEY[] = "kept-in-work-area";
 
@@ -279,6 +279,7 @@ static gboolean cb_turned(gpointer data)
 
     if (!gtk_widget_get_mapped(window))
         return FALSE;
+    kept(window)->tries = 0;
     if (GTK_IS_DIALOG(window))
         fit_content(window);
     fit_window(window);
