@@ -57,7 +57,7 @@ def sh(*command):
     subprocess.run(command, check=True, stdout=subprocess.DEVNULL)
 
 
-def wait_for(condition, limit=30):
+def wait_for(condition, limit=90):
     """Waits until the condition holds; whether it came about within the limit in seconds."""
     end = time.monotonic() + limit
     while not condition():

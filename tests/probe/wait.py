@@ -5,7 +5,7 @@ import os
 import time
 
 # Ends a failure; nothing measures speed with it. A slow machine may have a longer one.
-LIMIT = float(os.environ.get("WAIT_LIMIT", "20"))
+LIMIT = float(os.environ.get("WAIT_LIMIT", "60"))
 # Between two looks, at most: where looking takes more than waiting it may be longer.
 PAUSE = float(os.environ.get("WAIT_PAUSE", "0.03"))
 
