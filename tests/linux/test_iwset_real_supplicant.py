@@ -1,16 +1,15 @@
 # SPDX-License-Identifier: MIT
 """What the real wpa_supplicant reads out of the files that iwset gives it."""
 
-import os
 import random
-import subprocess
 
 import pytest
 
 import joining
 import machine
+import parsing
 from joining import iwset
-from machine import STATE, read, sh, wait_for, write
+from machine import STATE, read, sh, write
 
 
 def read_back(field, *words, **options):
@@ -18,19 +17,11 @@ def read_back(field, *words, **options):
     joining.set_up()
     iwset(*words, **options)
     sh("umount", "/sys/class/net")
-    if not os.path.exists("/sys/class/net/parser0"):
-        sh("ip", "link", "add", "parser0", "type", "veth", "peer", "name", "parser1")
-    control = f"{machine.ROOT}/control"
     path = f"{machine.ROOT}/real.conf"
     write(path, read(f"{machine.LOG}/conf").replace(STATE.encode(), machine.ROOT.encode()))
-    process = subprocess.Popen(["wpa_supplicant", "-i", "parser0", "-D", "wired", "-c", path],
-                               stdout=subprocess.PIPE, stderr=subprocess.STDOUT)
+    process = parsing.start(path)
     try:
-        assert wait_for(lambda: os.path.exists(f"{control}/parser0") or process.poll() is not None)
-        assert process.poll() is None, process.stdout.read()
-        return subprocess.run(
-            ["wpa_cli", "-p", control, "-i", "parser0", "get_network", "0", field],
-            stdout=subprocess.PIPE, check=True).stdout.strip()
+        return parsing.ask("get_network", "0", field)
     finally:
         process.terminate()
         process.wait(20)

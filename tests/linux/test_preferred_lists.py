@@ -12,7 +12,8 @@ import tempfile
 import pytest
 
 import machine
-from machine import read, sh, wait_for, write
+import parsing
+from machine import read, write
 
 CORPUS = os.path.join(machine.TOP, "tests", "fuzz", "corpus", "preferred_file")
 LISTS = 1000
@@ -75,20 +76,15 @@ class Supplicant:
     """The real one, on an interface without a radio, asked through its control socket."""
 
     def __init__(self):
-        sh("ip", "link", "add", "parser0", "type", "veth", "peer", "name", "parser1")
         self.path = f"{machine.ROOT}/lists.conf"
-        self.control = f"{machine.ROOT}/control"
         self.own = f"{machine.ROOT}/asking"
-        self.head = f"ctrl_interface={self.control}\nupdate_config=1\n".encode()
+        self.head = f"ctrl_interface={parsing.control()}\nupdate_config=1\n".encode()
         write(self.path, self.head)
-        self.process = subprocess.Popen(
-            ["wpa_supplicant", "-i", "parser0", "-D", "wired", "-c", self.path],
-            stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
-        assert wait_for(lambda: os.path.exists(f"{self.control}/parser0"))
+        self.process = parsing.start(self.path)
         self.socket = socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
         self.socket.settimeout(60)
         self.socket.bind(self.own)
-        self.socket.connect(f"{self.control}/parser0")
+        self.socket.connect(f"{parsing.control()}/parser0")
 
     def ask(self, question):
         self.socket.send(question)
