@@ -29,7 +29,9 @@ def spoken(one):
 def role(one):
     """What it is, None once it has gone."""
     with contextlib.suppress(GLib.Error):
-        return one.get_role_name()
+        name = one.get_role_name()
+        # As at-spi2-core 2.56 and later say it.
+        return "push button" if name == "button" else name
     return None
 
 
@@ -132,7 +134,7 @@ class Reader:
         for one in walk(window):
             # It may go while it is asked.
             with contextlib.suppress(GLib.Error):
-                if one.get_role_name() == kind and spoken(one) == name:
+                if role(one) == kind and spoken(one) == name:
                     return one
         return None
 
@@ -156,15 +158,15 @@ class Reader:
         """The controls that could only be called by what they are or hold."""
         found = []
         for one in walk(window):
-            if one.get_role_name() == "combo box":
+            if role(one) == "combo box":
                 # The toolkit calls one without a name by its item.
                 item = one.get_selection_iface().get_selected_child(0)
                 named = spoken(one) not in ("", item and item.get_name())
             else:
-                named = one.get_role_name() in CONTAINERS or spoken(one) or \
+                named = role(one) in CONTAINERS or spoken(one) or \
                     not one.get_state_set().contains(Atspi.StateType.FOCUSABLE)
             if not named:
-                found.append(one.get_role_name())
+                found.append(role(one))
         return found
 
     # The keyboard.
@@ -173,8 +175,8 @@ class Reader:
         with contextlib.suppress(GLib.Error):
             for one in walk(window):
                 if one.get_state_set().contains(Atspi.StateType.FOCUSED) and \
-                        one.get_role_name() != "table cell":
-                    return spoken(one), one.get_role_name()
+                        role(one) != "table cell":
+                    return spoken(one), role(one)
         return None
 
     def go(self, window, name, kind):
