@@ -58,7 +58,7 @@ def settled_picture(d, app, known=None):
         return known
     last, alike = [None], [0]
 
-    # Whatever comes by itself in its first half minute has come: the clock goes fifty times as fast.
+    # What comes by itself in its first half minute has come: the clock goes 50 times as fast.
     def stays():
         before, last[0] = last[0], picture(d, app)
         alike[0] = alike[0] + 1 if before == last[0] else 0
