@@ -31,6 +31,7 @@ LOOKS = 12  # without a change
 @pytest.fixture(scope="module", name="street")
 def fixture_street(shared_device):
     d = shared_device("street", rate=50)
+    d.display.move(1023, 767)  # over the list it may bring a tooltip
     subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-", "-o", f"{d.state}/search.so"],
                    input=SEARCH, text=True, check=True)
     d.sh(f"mkdir -p {LONE}/icons && cp -R /usr/share/icons/hicolor {LONE}/icons")
