@@ -12,8 +12,8 @@ constexpr char DEBUG_PREFIX[] = "WIRELESS-LAN-DEBUG: ";
 // Prints the prefix, the formatted text (4,000 bytes at most) and a newline in a single write.
 void debug_line(const char *format, ...) G_GNUC_PRINTF(1, 2);
 
-// From here on the lines are collected and written in blocks, because a scan has a
-// thousand of them, until write_debug_lines() writes the rest.
+// From here on the lines are collected and written in blocks, because a scan has a thousand of
+// them, until write_debug_lines() writes the rest.
 void collect_debug_lines();
 void write_debug_lines();
 

@@ -90,8 +90,6 @@ int main(int argc, char **argv)
     bindtextdomain(TEXT_DOMAIN, PROGRAM_LOCALEDIR);
     textdomain(TEXT_DOMAIN);
     bind_textdomain_codeset(TEXT_DOMAIN, "UTF-8");
-    // Its thread reads the font configuration while the display is opened and the device asked.
-    pango_cairo_font_map_get_default();
     gtk_init(&argc, &argv);
     // Its thread reads the font configuration, the longest piece of the start, while the device is
     // asked.
