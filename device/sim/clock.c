@@ -3,9 +3,13 @@
 // them, follow a page that the test writes. Virtual time passes RATE times as fast as real time;
 // at rate 0 it does not move until the test moves it.
 #define _GNU_SOURCE
+#include <dlfcn.h>
+#include <errno.h>
 #include <fcntl.h>
+#include <linux/futex.h>
 #include <poll.h>
 #include <signal.h>
+#include <stdarg.h>
 #include <stdbool.h>
 #include <stdint.h>
 #include <sys/mman.h>
@@ -223,4 +227,40 @@ unsigned int sleep(unsigned int seconds)
 int usleep(useconds_t microseconds)
 {
     return wait_for(deadline_after((int64_t)microseconds * 1000));
+}
+
+// Waits as futex(2) does with FUTEX_WAIT, until a moment of the monotonic clock.
+static long wait_on_futex(uint32_t *word, int flags, uint32_t expected,
+                          const struct timespec *moment)
+{
+    int64_t deadline = (int64_t)moment->tv_sec * 1000000000 + moment->tv_nsec;
+    for (;;) {
+        int64_t slice = next_slice(deadline);
+        struct timespec wait = to_timespec(slice);
+        long result = syscall(SYS_futex, word, FUTEX_WAIT | flags, expected, &wait, NULL, 0);
+        if (result == 0 || errno != ETIMEDOUT || slice == 0)
+            return result;
+    }
+}
+
+// Some runtimes compute a moment from the clock here and give it to the kernel, which would wait by
+// its own: Rust's standard library, in the toolkit's later picture loaders.
+long syscall(long number, ...)
+{
+    static long (*next)(long number, ...);
+    unsigned long argument[6];
+    va_list list;
+    va_start(list, number);
+    for (int i = 0; i < 6; i++)
+        argument[i] = va_arg(list, unsigned long);
+    va_end(list);
+    int operation = (int)argument[1];
+    if (number == SYS_futex && page != NULL && argument[3] != 0 &&
+        (operation & ~FUTEX_PRIVATE_FLAG) == FUTEX_WAIT_BITSET)
+        return wait_on_futex((uint32_t *)argument[0], operation & FUTEX_PRIVATE_FLAG,
+                             (uint32_t)argument[2], (const struct timespec *)argument[3]);
+    if (next == NULL)
+        next = (long (*)(long number, ...))dlsym(RTLD_NEXT, "syscall");
+    return next(number, argument[0], argument[1], argument[2], argument[3], argument[4],
+                argument[5]);
 }
