@@ -200,8 +200,11 @@ wpa_lines() {
         case $1 in
         *\"*\#*)
             # Here it would see a comment: it gets the key that the phrase makes under this name.
-            psk=$(name_bytes)
-            psk=$(printf '%s\n' "$1" | wpa_passphrase "${psk%.}" 2>/dev/null)
+            made_for=$(name_bytes)
+            made_for=${made_for%.}
+            # Later releases of it read from a terminal alone.
+            psk=$(printf '%s\n' "$1" | wpa_passphrase "$made_for" 2>/dev/null) ||
+                psk=$(wpa_passphrase "$made_for" "$1" 2>/dev/null)
             psk=${psk##*psk=}
             psk=${psk%%[!0-9a-f]*}
             [ ${#psk} -eq 64 ] || return 1
