@@ -58,17 +58,22 @@ ask() {
     limited 2 wpa_cli -p "$state/control" -i "$interface" "$@" 2>/dev/null
 }
 
-# is_joined: whether our supplicant is in a network; sets network to its number.
+# is_joined: whether our supplicant is in a network; sets network to its number. No answer is not a
+# no: it is asked again, since a busy machine may answer late.
 is_joined() {
     network=
     state_word=
+    for _ in 1 2 3; do
+        answer=$(ask status)
+        [ -z "$answer" ] || break
+    done
     while IFS='=' read -r field value; do
         case $field in
         wpa_state) state_word=$value ;;
         id) network=$value ;;
         esac
     done <<EOT
-$(ask status)
+$answer
 EOT
     [ "$state_word" = COMPLETED ]
 }

@@ -202,6 +202,18 @@ def test_events_that_come_late_do_nothing():
     assert (clients(), machine.ip_calls()) == ([], known)
 
 
+def test_a_supplicant_that_answers_late_is_asked_again():
+    begin(HOME)
+    known = machine.ip_calls()
+    joining.note("status", CONNECTED)
+    joining.note("late-status")
+    action("DISCONNECTED")
+    assert machine.ip_calls() == known
+    joining.note("late-status")
+    action("CONNECTED")
+    assert wait_for(clients)
+
+
 def test_a_supplicant_that_dies_is_started_again():
     process = begin(HOME)
     os.kill(running()[0], 9)
