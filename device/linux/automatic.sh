@@ -7,6 +7,8 @@
 #   follower.pid  wpa_cli, which tells wpa-action of every association of our supplicant
 #   addressed     the moment at which lnk-ifup was asked for an address in this network
 #   list          the list that the automatic has worked with last
+#   now           it begins at once what it would try again later
+#   sleeper.pid   what it waits for until it looks around again
 #   no-wep        the supplicant that runs knows no WEP
 #   next.conf     the supplicant's next configuration, taken over once its network is lost
 # "$interface", "$library" and "$state" are those of wireless-lan.sh.
