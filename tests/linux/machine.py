@@ -6,7 +6,6 @@ A test chooses the tools that are installed (choose), tells the stubs what to an
 command (run) and looks at its result, at what the stubs were called with (calls) and at the
 processes and files that stay."""
 
-import glob
 import os
 import re
 import shutil
@@ -278,10 +277,27 @@ def clients():
     return numbers("clients")
 
 
+def command_line(pid):
+    """The arguments of a process, each with a NUL at its end; none once it has ended. One that is
+    about to run another program has none for a moment."""
+    lines = []
+
+    def shown():
+        lines.append(read(f"/proc/{pid}/cmdline"))
+        return lines[-1] or not os.path.exists(f"/proc/{pid}/exe")
+    wait_for(shown, limit=5)
+    return lines[-1]
+
+
+def command_lines():
+    """Those of all processes, by their numbers."""
+    return {pid: command_line(pid) for pid in os.listdir("/proc") if pid.isdigit()}
+
+
 def running(name):
     """The numbers of the processes that were started as NAME."""
-    return [path.split("/")[2] for path in glob.glob("/proc/[0-9]*/cmdline")
-            if os.path.basename(read(path).split(b"\0")[0]) == name.encode()]
+    return [pid for pid, line in command_lines().items()
+            if os.path.basename(line.split(b"\0")[0]) == name.encode()]
 
 
 def alive(pid):

@@ -59,7 +59,7 @@ def ticks(process, count=3):
     """Waits until the automatic has looked around so many times more."""
     def sleeper():
         for child in read(f"/proc/{process.pid}/task/{process.pid}/children").split():
-            if read(f"/proc/{child.decode()}/cmdline").startswith(b"sleep\0"):
+            if machine.command_line(child.decode()).startswith(b"sleep\0"):
                 return child
         return None
     seen = set()
@@ -88,8 +88,7 @@ def joined(number=0):
 
 def at_work(command):
     """Whether a process has this among its words."""
-    return any(command in read(f"/proc/{path}/cmdline")
-               for path in os.listdir("/proc") if path.isdigit())
+    return any(command in line for line in machine.command_lines().values())
 
 
 def action(event, *moment, supplicant=None):

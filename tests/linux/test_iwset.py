@@ -124,14 +124,14 @@ def names_read(names, shell, awk):
     return [bytes.fromhex(line.decode()) for line in out.split()]
 
 
-@pytest.mark.parametrize("shell, awk", zip(machine.SHELLS, machine.AWKS))
+@pytest.mark.parametrize("shell, awk", list(zip(machine.SHELLS, machine.AWKS)))
 def test_what_the_list_shows_gives_the_name_back(shell, awk):
     names = [name for name in HOSTILE if name.strip(b"\0")]
     found = board.networks(convert(answer(numbered(names))))
     assert names_read([cell["essid"] for cell in found], shell, awk) == names
 
 
-@pytest.mark.parametrize("shell, awk", zip(machine.SHELLS, machine.AWKS))
+@pytest.mark.parametrize("shell, awk", list(zip(machine.SHELLS, machine.AWKS)))
 def test_the_name_itself(shell, awk):
     names = [name for name in HOSTILE
              if b"\0" not in name and not re.search(rb"\\x[0-9A-Fa-f]{2}", name)]
@@ -281,12 +281,9 @@ def absent():
 
 def followers():
     """The command lines of those that watch a join, without the subshells of each."""
-    found = {path.split("/")[2]: path for path in glob.glob("/proc/[0-9]*/cmdline")
-             if b"/iwset\0" in read(path)}
-    parents = {number: read(f"/proc/{number}/stat").rpartition(b") ")[2].split()[1:2]
-               for number in found}
-    return [path for number, path in found.items()
-            if not any(parent.decode() in found for parent in parents[number])]
+    found = [pid for pid, line in machine.command_lines().items() if b"/iwset\0" in line]
+    parents = {pid: read(f"/proc/{pid}/stat").rpartition(b") ")[2].split()[1:2] for pid in found}
+    return [pid for pid in found if not any(parent.decode() in found for parent in parents[pid])]
 
 
 def test_access_point_that_shows_up_late_refuses_the_key():
@@ -306,12 +303,12 @@ def test_follower_of_an_old_network_leaves_the_new_one_alone():
     old = followers()
     iwset("another")
     # What is noted now would be about the new network too, for whoever follows that.
-    for path in followers():
-        if path not in old:
-            os.kill(int(path.split("/")[2]), signal.SIGKILL)
+    for pid in followers():
+        if pid not in old:
+            os.kill(int(pid), signal.SIGKILL)
     note("status", joining.HANDSHAKE)
     note("networks", joining.DISABLED)
-    assert wait_for(lambda: not any(read(path) for path in old))
+    assert wait_for(lambda: not any(alive(pid) for pid in old))
     assert alive(supplicants()[-1])
 
 
@@ -529,7 +526,7 @@ def test_event_that_decides_nothing_yet(event, word):
     assert alive(late)
     # The key is in no list of processes for as long as the join is watched.
     assert followers()
-    assert not [path for path in glob.glob("/proc/[0-9]*/cmdline") if b"12345678" in read(path)]
+    assert not [line for line in machine.command_lines().values() if b"12345678" in line]
     joining.event(f"CTRL-EVENT-CONNECTED - Connection to {BSS} completed [id=0 id_str=]")
     assert wait_for(lambda: not followers())
     assert reason() == b""

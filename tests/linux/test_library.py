@@ -1,7 +1,6 @@
 # SPDX-License-Identifier: MIT
 """What the commands share: limits of time, reasons, missing tools, PATH, defaults, taking turns."""
 
-import glob
 import os
 import subprocess
 import time
@@ -25,7 +24,7 @@ def library(text, shell=("sh",), path=machine.path_line(), limit=60):
 
 
 def sleepers():
-    return [path for path in glob.glob("/proc/[0-9]*/cmdline") if read(path).startswith(b"sleep\0")]
+    return [pid for pid, line in machine.command_lines().items() if line.startswith(b"sleep\0")]
 
 
 @SHELLS

@@ -1,7 +1,6 @@
 # SPDX-License-Identifier: MIT
 """Real DHCP clients and a real server on a (virtual) wire."""
 
-import glob
 import os
 import re
 import shutil
@@ -29,9 +28,9 @@ def routes():
 
 def left(name):
     """The processes of a client."""
-    return [path for path in glob.glob("/proc/[0-9]*/cmdline")
-            if name.encode() in os.path.basename(read(path).split(b"\0")[0].split(b" ")[0])
-            and alive(path.split("/")[2])]
+    return [pid for pid, line in machine.command_lines().items()
+            if name.encode() in os.path.basename(line.split(b"\0")[0].split(b" ")[0])
+            and alive(pid)]
 
 
 def install_client(name):
