@@ -345,6 +345,17 @@ def test_a_new_card_of_the_same_name_is_begun_with_anew():
     assert wait_for(lambda: not alive(first[0]) and running())
 
 
+def test_a_card_that_is_replaced_while_it_is_begun_with():
+    joining.note("slow-supplicant")
+    save(HOME)
+    joining.note("status", SEARCHING)
+    start("wireless-lan-auto", "wlan0")
+    assert wait_for(supplicants)
+    make_interfaces(("wlan0", 9, 1, "phy80211"))
+    machine.forget("slow-supplicant")
+    assert wait_for(lambda: len(supplicants()) == 2 and running())
+
+
 def test_status():
     assert run("wireless-lan-auto", "--status", "wlan0")[:2] == (3, b"wlan0 is not looked after\n")
     begin(HOME)
