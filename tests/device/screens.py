@@ -2,6 +2,7 @@
 """A tour through every window and dialog of the program, and a look at each: which control lies
 outside the screen, over another, or shows less than its text needs."""
 
+import ctypes
 import functools
 import re
 import subprocess
@@ -57,6 +58,28 @@ def _twice(text):
     return "\\n".join(line(part) for part in text.split("\\n"))
 
 
+class _StockItem(ctypes.Structure):
+    _fields_ = [("id", ctypes.c_char_p), ("label", ctypes.c_char_p), ("modifier", ctypes.c_uint),
+                ("key", ctypes.c_uint), ("domain", ctypes.c_char_p)]
+
+
+class _Names(ctypes.Structure):
+    _fields_ = [("name", ctypes.c_char_p), ("next", ctypes.c_void_p)]
+
+
+def _stock_labels():
+    """The labels of the toolkit's stock items, in English: its catalogues are not everywhere."""
+    toolkit = ctypes.CDLL("libgtk-x11-2.0.so.0")
+    toolkit.gtk_stock_list_ids.restype = ctypes.POINTER(_Names)
+    left, item = toolkit.gtk_stock_list_ids(), _StockItem()
+    labels = set()
+    while left:
+        if toolkit.gtk_stock_lookup(left.contents.name, ctypes.byref(item)) and item.label:
+            labels.add(item.label.decode())
+        left = ctypes.cast(left.contents.next, ctypes.POINTER(_Names))
+    return sorted(labels)
+
+
 @functools.lru_cache(maxsize=None)
 def catalogues(language):
     """{path on the device: content} for one of LANGUAGES."""
@@ -66,13 +89,10 @@ def catalogues(language):
                                  check=True, stdout=subprocess.PIPE).stdout
         return {f"{CATALOGUES}/{SPOKEN[language]}/LC_MESSAGES/wireless-lan.mo": content}
     if language == "long":
-        toolkit = subprocess.run(["msgunfmt", "/usr/share/locale/de/LC_MESSAGES/gtk20.mo"],
-                                 check=True, stdout=subprocess.PIPE, encoding="utf-8").stdout
-        stock = re.findall(r'^msgctxt "(Stock label)"\nmsgid "(.+)"$', toolkit, re.M)
         return {f"{CATALOGUES}/xx/LC_MESSAGES/wireless-lan.mo":
                 _catalogue((context, text, _twice(text)) for context, text in own),
                 "/usr/share/locale/xx/LC_MESSAGES/gtk20.mo":
-                _catalogue((context, text, _twice(text)) for context, text in stock)}
+                _catalogue(("Stock label", text, _twice(text)) for text in _stock_labels())}
     return {}
 
 

@@ -282,7 +282,9 @@ static void answer_props(GString *out, const char *id)
     g_string_append_printf(out, ", \"size-request\": [%d, %d], \"properties\": {", width, height);
     const char *between = "";
     for (guint i = 0; i < count; i++) {
-        if ((specs[i]->flags & G_PARAM_READABLE) == 0)
+        // Ubuntu's toolkit says of one of its own that it can be read, and cannot read it.
+        if ((specs[i]->flags & G_PARAM_READABLE) == 0 ||
+            g_str_has_prefix(specs[i]->name, "ubuntu-"))
             continue;
         GValue value = G_VALUE_INIT;
         g_value_init(&value, specs[i]->value_type);
