@@ -70,7 +70,8 @@ def start_of_the_machine(net, what, *tracer):
 
 def end_of_the_machine():
     """What a machine that is switched off leaves of itself: nothing under /run."""
-    for entry in os.listdir(STATE):
+    # The automatic (auto.pid) first: it would see to the others' end.
+    for entry in sorted(os.listdir(STATE)):
         if entry.endswith(".pid"):
             with open(f"{STATE}/{entry}") as file:
                 try:
