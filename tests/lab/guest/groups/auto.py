@@ -17,8 +17,9 @@ from probe import wait_until
 from steps import (check, connected_to, linked, press_button, press_connect, same,
                    wanted_row, write_preferred)
 
-FIRST = network(b"First", key="the first key", net=1)
-SECOND = network(b"Second", key="second to none", net=2)
+# The window's file keeps the first word of a key, once it has been written again.
+FIRST = network(b"First", key="the-first-key", net=1)
+SECOND = network(b"Second", key="second-to-none", net=2)
 THIRD = network(b"Third", net=3)
 FOURTH = network(b"Fourth", net=4)
 STATIONS = {"02:00:00:00:01:00": "First", "02:00:00:00:02:00": "Second",
@@ -188,8 +189,9 @@ def the_order_of_the_window_is_taken_over():
     box.press("gtk-ok")
     box.wait_gone()
     wait_until(lambda: os.path.exists(f"{STATE}/next.conf"), "the list to be noticed", 60)
-    same((where(), address(), supplicant()[0]), ("Second", 2, before), "the connection")
     w.refresh_until(lambda now: "First" in [one[0] for one in now], "the first is in reach")
+    same((where(), address(), supplicant()[0]), ("Second", 2, before), "the connection")
+    check(os.path.exists(f"{STATE}/next.conf"), "the list has been taken over at once")
     air.switch_off(2)
     wait_until(lambda: address() == 3, lambda: f"an address of 3, there is {address()}", 300)
     same(where(), "Third", "the network, with the first in reach,")
