@@ -280,7 +280,7 @@ def absent():
 
 
 def followers():
-    """The command lines of those that watch a join, without the subshells of each."""
+    """The process numbers of those that watch a join, without the subshells of each."""
     found = [pid for pid, line in machine.command_lines().items() if b"/iwset\0" in line]
     parents = {pid: read(f"/proc/{pid}/stat").rpartition(b") ")[2].split()[1:2] for pid in found}
     return [pid for pid in found if not any(parent.decode() in found for parent in parents[pid])]
@@ -310,6 +310,16 @@ def test_follower_of_an_old_network_leaves_the_new_one_alone():
     note("networks", joining.DISABLED)
     assert wait_for(lambda: not any(alive(pid) for pid in old))
     assert alive(supplicants()[-1])
+
+
+def test_follower_of_an_old_network_leaves_the_reason_of_a_refused_key():
+    note("slow-status")
+    assert iwset("cafe")[0] == 0
+    assert wait_for(lambda: [call for call in calls("wpa_cli") if call[-1] == b"status"])
+    assert run("iwset", *joining.arguments("x", "1234", "open"))[0] == 1
+    forget("slow-status")
+    assert wait_for(lambda: not followers())
+    assert reason() == b"bad-wep-key\n"
 
 
 # ---- secrets
