@@ -1,6 +1,7 @@
 # SPDX-License-Identifier: MIT
 """The simulated device of one test: a directory of state, namespaces, a screen, and the program."""
 
+import functools
 import json
 import os
 import re
@@ -42,6 +43,7 @@ class Command:
         return os.path.basename(self.path)
 
 
+@functools.cache
 def built():
     """The directory with the device's tools and the probe, built when their sources are newer."""
     directory = subprocess.run([f"{TOP}/device/sim/build"], check=True, stdout=subprocess.PIPE,
