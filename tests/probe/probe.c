@@ -4,7 +4,7 @@
 // answers only when the program has nothing more urgent to do: events handled, sizes settled, idle
 // jobs done, all drawn, and that by the X server too.
 //
-// One question a line, one JSON value a line back. Bytes of texts are written as U+0000 to U+00FF.
+// One question a line, one JSON value a line back. Texts keep their bytes, UTF-8 or not.
 //   tree             every top-level window with all that is in it
 //   props ID         all properties of a widget, and those that its container holds for it
 //   registry KEY     the object the main window holds under the key, or null
@@ -28,7 +28,7 @@ static void put_text(GString *out, const char *text)
     }
     g_string_append_c(out, '"');
     for (const unsigned char *at = (const unsigned char *)text; *at != '\0'; at++) {
-        if (*at < ' ' || *at == '"' || *at == '\\' || *at > '~')
+        if (*at < ' ' || *at == '"' || *at == '\\')
             g_string_append_printf(out, "\\u%04x", *at);
         else
             g_string_append_c(out, (char)*at);

@@ -8,19 +8,6 @@ import socket
 from .wait import LIMIT, wait_until
 
 IDLE = "Wireless network selection"  # the title while nothing is under way
-
-
-def _bytes_back(value):
-    """The probe writes bytes as characters; texts become str again, stray bytes as surrogates."""
-    if isinstance(value, str):
-        return value.encode("latin-1").decode("utf-8", "surrogateescape")
-    if isinstance(value, list):
-        return [_bytes_back(one) for one in value]
-    if isinstance(value, dict):
-        return {key: _bytes_back(one) for key, one in value.items()}
-    return value
-
-
 EDGE = 3  # pixels of a scrolled window's shadow, which takes no press
 
 
@@ -317,7 +304,8 @@ class Program(Pane):
         self._socket.sendall(question.encode() + b"\n")
         answer = self._stream.readline()
         assert answer, self._ended()
-        return _bytes_back(json.loads(answer))
+        # Stray bytes in a text become surrogates.
+        return json.loads(answer.decode("utf-8", "surrogateescape"))
 
     def _connect(self):
         def attempt():
