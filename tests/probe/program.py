@@ -18,9 +18,12 @@ class Widget(dict):
     parent = None
 
     def walk(self):
-        yield self
-        for child in self["children"]:
-            yield from child.walk()
+        """This one and all in it, each before what is in it."""
+        ahead = [self]
+        while ahead:
+            one = ahead.pop()
+            yield one
+            ahead += reversed(one["children"])
 
     def all(self, name=None, type=None, **wanted):
         """All widgets in this one (itself too) with this name, type and further values."""
