@@ -99,6 +99,28 @@ static void put_value(GString *out, const GValue *value)
     }
 }
 
+// The place of a window on the screen. Only that of a top-level window has to be asked of the X
+// server, once for one answer.
+static GdkWindow *located;
+static gint located_x, located_y;
+
+static void origin_of(GdkWindow *window, gint *x, gint *y)
+{
+    GdkWindow *top = gdk_window_get_toplevel(window);
+    if (located != top) {
+        gdk_window_get_origin(top, &located_x, &located_y);
+        located = top;
+    }
+    *x = located_x;
+    *y = located_y;
+    for (; window != top; window = gdk_window_get_parent(window)) {
+        gint inner_x, inner_y;
+        gdk_window_get_position(window, &inner_x, &inner_y);
+        *x += inner_x;
+        *y += inner_y;
+    }
+}
+
 static GdkRectangle on_screen(GtkWidget *widget)
 {
     GtkAllocation at;
@@ -109,7 +131,7 @@ static GdkRectangle on_screen(GtkWidget *widget)
     result.height = at.height;
     if (!gtk_widget_get_realized(widget) || gtk_widget_get_window(widget) == NULL)
         return result;
-    gdk_window_get_origin(gtk_widget_get_window(widget), &x, &y);
+    origin_of(gtk_widget_get_window(widget), &x, &y);
     result.x = x + (gtk_widget_get_has_window(widget) ? 0 : at.x);
     result.y = y + (gtk_widget_get_has_window(widget) ? 0 : at.y);
     return result;
@@ -428,10 +450,10 @@ static void answer_cell(GString *out, const char *id, int row, int column)
         GtkTreePath *path = gtk_tree_path_new_from_indices(row, -1);
         gtk_tree_view_get_background_area(view, path, gtk_tree_view_get_column(view, column), &at);
         gtk_tree_path_free(path);
-        gdk_window_get_origin(gtk_tree_view_get_bin_window(view), &x, &y);
+        origin_of(gtk_tree_view_get_bin_window(view), &x, &y);
     } else if (GTK_IS_CLIST(widget)) {
         GtkCList *list = GTK_CLIST(widget);
-        gdk_window_get_origin(list->clist_window, &x, &y);
+        origin_of(list->clist_window, &x, &y);
         // Rows are one under the other, each with a line of one pixel above it.
         at.x = list->column[column].area.x + list->hoffset;
         at.y = (list->row_height + 1) * row + 1 + list->voffset;
@@ -445,6 +467,7 @@ static void answer(GString *out, char *question)
 {
     g_auto(GStrv) words = g_strsplit(question, " ", 4);
     guint count = g_strv_length(words);
+    located = NULL;
     if (strcmp(words[0], "tree") == 0)
         answer_tree(out);
     else if (strcmp(words[0], "props") == 0 && count == 2)
