@@ -24,14 +24,6 @@ def wait_controls(app, *wanted):
     wait_until(lambda: controls(app) == wanted, lambda: f"{wanted}; they are {controls(app)}")
 
 
-def refresh(app):
-    """Presses Refresh and waits until the rows are there again."""
-    scans = len(app.device.commands("iwlist"))
-    app.press("button-refresh")
-    app.device.wait_command("iwlist", scans + 1)
-    return app.wait_listed()
-
-
 def states(app):
     return [row[4] for row in app.networks()]
 
@@ -86,7 +78,7 @@ def test_no_interface_leaves_the_controls(device):
     assert controls(app) == ("+++++-", "No Wireless Device")
     assert len(d.commands("iwlist")) == 1 and d.states() == [5]
     d.set_interfaces("wlan0")
-    refresh(app)
+    app.refresh()
     assert app.quit() == 0
 
 
@@ -161,16 +153,16 @@ def test_match_with_the_access_point(device):
     assert states(app) == ["Disconnect"] * 8, "nobody"
 
     d.associate("02:00:00:00:00:03")
-    refresh(app)
+    app.refresh()
     assert states(app) == (["Disconnect"] * 2 + ["Connected\nIP address invalid"] +
                            ["Disconnect"] * 5)
     d.address("10.11.12.13")
-    refresh(app)
+    app.refresh()
     assert states(app)[2] == "Connected\nIP Address:10.11.12.13"
 
     # An access point that the scan does not name.
     d.associate("02:00:00:00:00:99")
-    refresh(app)
+    app.refresh()
     assert states(app) == ["Disconnect"] * 8
 
     # The same address twice: the last one. In small letters: another one.
@@ -178,7 +170,7 @@ def test_match_with_the_access_point(device):
     d.set_networks(*[(name, "off", "70/100", "Master", mac) for name, mac in (
         ("first", "02:00:00:00:0A:01"), ("last", "02:00:00:00:0A:01"),
         ("small", "02:00:00:00:0a:01"))])
-    refresh(app)
+    app.refresh()
     assert states(app) == ["Disconnect", "Connected\nIP Address:10.11.12.13", "Disconnect"]
     app.click_row("view-press", 1)
     wait_until(lambda: app.label("button-connect") == "gtk-disconnect", "the button to follow")
@@ -239,11 +231,11 @@ def test_any_scan_text(device):
         app.wait_title(TITLE)
 
     d.set_scan(b"x" * 1_000_000 + b"\n" + network)
-    assert [row[0] for row in refresh(app)] == ["home"]
+    assert [row[0] for row in app.refresh()] == ["home"]
     d.set_scan(scan_text(*[f"net {number}" for number in range(10_000)]))
-    assert len(refresh(app)) == 128
+    assert len(app.refresh()) == 128
     d.set_scan(network.replace(b"\n", b"\r\n"))
-    assert [row[:4] for row in refresh(app)] == [["home", "Master", "on", "70/100"]]
+    assert [row[:4] for row in app.refresh()] == [["home", "Master", "on", "70/100"]]
     assert app.quit() == 0
 
 
@@ -265,7 +257,7 @@ def test_commands_that_fail(device):
     # A status that tells of failure does not matter when there is text.
     d.command("iwlist", status=3)
     d.command("ifconfig", missing=True)
-    assert len(refresh(app)) == 8
+    assert len(app.refresh()) == 8
     d.command("ifconfig")
     d.command("cat", missing=True)
     app.press("button-refresh")
@@ -274,7 +266,7 @@ def test_commands_that_fail(device):
     d.command("cat")
     # A scan that takes its time.
     d.command("iwlist", delay=0.7)
-    assert len(refresh(app)) == 8
+    assert len(app.refresh()) == 8
     assert app.quit() == 0
 
 
@@ -291,7 +283,7 @@ def test_the_scan_cannot_be_started(device):
     assert app.wait_listed() == [row[:4] + ["Disconnect"] for row in before]
     assert app.stderr().count("\npipe: Too many open files\n") == 2, "discovery and scan"
     d.sh(" ".join(limit + ["--nofile=1024:"]))
-    assert [row[0] for row in refresh(app)] == ["another"]
+    assert [row[0] for row in app.refresh()] == ["another"]
     assert app.quit() == 0
 
 

@@ -86,8 +86,7 @@ def test_what_is_in_sight_at_once(device):
     app = screens.start(d)
     assert steady(app)["frame"] == [0, 0, 480, 272]
     assert whole(app, "title-label", "button-connect")
-    app.press("button-refresh")
-    app.wait_listed()
+    app.refresh()
     for name, title in zip(buttons[1:], (SETTINGS, LIST)):  # scrolled to
         app.press(name)
         dialog = app.dialog(title)

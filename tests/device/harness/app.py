@@ -30,6 +30,14 @@ class App(Program):
                    lambda: f"{text!r} printed {count} times in\n{self.stdout()}\n{self.stderr()}",
                    limit)
 
+    def refresh(self):
+        """Presses Refresh and waits until the rows are there again."""
+        scans = len(self.device.commands("iwlist"))
+        self.press("button-refresh")
+        # The press may still be on its way through the window manager; the old rows are there.
+        self.device.wait_command("iwlist", scans + 1)
+        return self.wait_listed()
+
     @property
     def pid(self):
         """Process id as this machine sees it."""
