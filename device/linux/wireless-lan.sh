@@ -217,13 +217,26 @@ runs() {
     [ -n "$began" ] && [ "$(start_time "$pid")" = "$began" ]
 }
 
-# end_process PID: ends a process and waits until it has gone.
+# family PID: prints the number of a process and of all that it has started, but not ours.
+family() {
+    [ "$1" != "$$" ] || return 0
+    printf '%s\n' "$1"
+    for entry in /proc/[0-9]*; do
+        { read -r line <"$entry/stat"; } 2>/dev/null || continue
+        line=${line##*) ? }
+        [ "${line%% *}" != "$1" ] || family "${entry##*/}"
+    done
+}
+
+# end_process PID: ends a process and waits until it has gone. One that has no time to end by itself
+# leaves its helpers behind, as dhcpcd does: they are ended with it.
 end_process() {
     since=$(start_time "$1") || return 0
     kill "$1" 2>/dev/null
-    tries=50
+    tries=70
     while [ "$tries" -gt 0 ] && [ "$(start_time "$1")" = "$since" ]; do
-        [ "$tries" -gt 20 ] || kill -KILL "$1" 2>/dev/null
+        # shellcheck disable=SC2046 # one argument a number
+        [ "$tries" -gt 20 ] || kill -KILL $(family "$1") 2>/dev/null
         pause 0.1
         tries=$((tries - 1))
     done

@@ -4,6 +4,7 @@
 import os
 import re
 import shutil
+import signal
 import subprocess
 
 import pytest
@@ -246,24 +247,27 @@ def test_lease_is_given_back(far):
         process.wait(20)
 
 
-def test_clients_of_others_are_ended(server):
-    """They would set their address again, beside the one that is wanted."""
+@pytest.mark.parametrize("hangs", (False, True), ids=("ends", "hangs"))
+@pytest.mark.parametrize("name", REAL_CLIENTS)
+def test_client_of_somebody_else_is_ended(name, hangs, server):
+    """It would set its address again, beside the one that is wanted. One that does not end by
+    itself leaves no helper behind."""
+    words = {"dhclient": ["-d", "-lf", "/run/l", "-pf", "/run/p"], "udhcpc": ["-f", "-i"],
+             "dhcpcd": ["-B", "-4"]}[name]
     static("10.7.0.9", "255.255.255.0", "10.7.0.255", "10.7.0.1")
-    for name, words in (("dhclient", ["-d", "-lf", "/run/l", "-pf", "/run/p"]),
-                        ("udhcpc", ["-f", "-i"]), ("dhcpcd", ["-B", "-4"])):
-        if name not in REAL_CLIENTS:
-            continue
-        install_client(name)
-        subprocess.Popen([name, *words, "wlan0"], stdout=subprocess.DEVNULL,
-                         stderr=subprocess.DEVNULL)
-        assert wait_for(lambda: left(name))
-        if name != "udhcpc":
-            assert wait_for(lambda: re.search(rb"10\.7\.0\.[56]", addresses())), name
-        status, _, err = run("lnk-ifup", "wlan0")
-        assert (status, err) == (
-            0, f"lnk-ifup: another DHCP client on wlan0 has been ended: {name}\n".encode())
-        assert wait_for(lambda: not left(name))
-        assert addresses().count(b"inet ") == 1 and b"10.7.0.9/24" in addresses()
+    install_client(name)
+    client = subprocess.Popen([name, *words, "wlan0"], stdout=subprocess.DEVNULL,
+                              stderr=subprocess.DEVNULL)
+    assert wait_for(lambda: left(name))
+    if name != "udhcpc":
+        assert wait_for(lambda: re.search(rb"10\.7\.0\.[56]", addresses()))
+    if hangs:
+        client.send_signal(signal.SIGSTOP)
+    status, _, err = run("lnk-ifup", "wlan0")
+    assert (status, err) == (
+        0, f"lnk-ifup: another DHCP client on wlan0 has been ended: {name}\n".encode())
+    assert wait_for(lambda: not left(name))
+    assert addresses().count(b"inet ") == 1 and b"10.7.0.9/24" in addresses()
 
 
 # ---- what the kernel learns by itself
