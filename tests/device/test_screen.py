@@ -128,3 +128,20 @@ def test_the_screen_turns_while_it_runs(device, manager):
         d.display.panel(40)
         fits(app)
         assert steady(app)["frame"] == [0, 0, 480, 232]
+
+
+def test_a_size_from_before_the_turn_is_not_kept(device):
+    """A busy window manager says it when more has been asked for since."""
+    d = screen(device, (1024, 768))
+    app = screens.start(d)
+    as_opened = steady(app)["rect"]
+    for _ in range(5):
+        d.display.turn(800, 480)
+        wait_until(lambda: app.tree()["frame"] == [0, 0, 800, 480], lambda: app.tree()["frame"])
+        with d.display.window_manager_asleep():
+            for size in ((480, 272), (1024, 768)):
+                d.display.turn(*size)
+                for _ in range(2):
+                    d.display.set_work_area(0, 0, *size)
+                    app.tree()  # once it has answered it has asked for its size
+        wait_until(lambda: app.tree()["rect"][2:] == as_opened[2:], lambda: app.tree()["rect"])

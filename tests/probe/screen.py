@@ -140,6 +140,12 @@ class Screen:
         wait_until(lambda: self.work_area()[3] <= self.height - height, "the panel's place")
         return bar
 
+    def set_work_area(self, *area):
+        """What a window manager says that windows may cover: x, y, width, height."""
+        self.root.change_property(self._x.intern_atom("_NET_WORKAREA"), Xatom.CARDINAL, 32,
+                                  list(area) * 4)
+        self._x.sync()
+
     def work_area(self):
         """[x, y, width, height] of what windows may cover."""
         area = self.root.get_full_property(self._x.intern_atom("_NET_WORKAREA"),

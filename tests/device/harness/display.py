@@ -1,7 +1,9 @@
 # SPDX-License-Identifier: MIT
 """A screen of a test's own: X server and window manager."""
 
+import contextlib
 import os
+import signal
 import subprocess
 
 from Xlib import X
@@ -34,6 +36,13 @@ class Display(Screen):
         self._processes.append(subprocess.Popen(
             ["setpriv", "--pdeathsig", "KILL"] + command, stdin=subprocess.DEVNULL,
             stdout=self._log, stderr=self._log, **more))
+
+    @contextlib.contextmanager
+    def window_manager_asleep(self):
+        """Meanwhile it answers nothing; what it is asked waits."""
+        self._processes[1].send_signal(signal.SIGSTOP)
+        yield
+        self._processes[1].send_signal(signal.SIGCONT)
 
     def screenshot(self, path):
         """Saves what the screen shows as a PNG file; gives the path."""

@@ -14,6 +14,8 @@ constexpr gint FRAME_ALLOWANCE = 64;
 
 constexpr gint MAX_TRIES = 20;
 
+constexpr GtkRequisition UNTOLD = {G_MAXINT, G_MAXINT};
+
 constexpr char KEPT_KEY[] = "kept-in-work-area";
 
 struct kept_window {
@@ -21,6 +23,7 @@ struct kept_window {
     GtkRequisition opening; // its default size; -1: none
     gboolean limited;       // the work area is smaller than the window would be
     gint tries;             // to make it fit, one after the other
+    GtkRequisition growing; // what it asks for on a larger screen, until it has it; 0: nothing
     GtkWidget *content;     // of a dialog, once it is in a scrolled window
 };
 
@@ -131,7 +134,7 @@ static GtkRequisition fitting_size(GtkWidget *window, gint width, gint height)
     kept_window *of = kept(window);
     const GtkRequisition largest = largest_size(window);
 
-    if (of->limited) {
+    if (of->limited || of->growing.width > 0) {
         width = MAX(width, MAX(of->natural.width, of->opening.width));
         height = MAX(height, MAX(of->natural.height, of->opening.height));
     }
@@ -139,8 +142,8 @@ static GtkRequisition fitting_size(GtkWidget *window, gint width, gint height)
     return {MIN(width, largest.width), MIN(height, largest.height)};
 }
 
-// Makes a window that is shown fit.
-static void fit_window(GtkWidget *window)
+// Makes a window that is shown fit. `told` is the size that GTK+ is being told.
+static void fit_window(GtkWidget *window, GtkRequisition told)
 {
     const GdkRectangle area = work_area(gtk_widget_get_screen(window));
     GdkRectangle frame;
@@ -150,11 +153,14 @@ static void fit_window(GtkWidget *window)
     gdk_window_get_frame_extents(gtk_widget_get_window(window), &frame);
 
     const GtkRequisition wanted = fitting_size(window, width, height);
+    const gboolean grows =
+        MIN(width, told.width) < wanted.width || MIN(height, told.height) < wanted.height;
 
+    kept(window)->growing = grows ? wanted : GtkRequisition{0, 0};
     frame.width += wanted.width - width;
     frame.height += wanted.height - height;
     gtk_widget_queue_resize(window);
-    if (wanted.width != width || wanted.height != height) {
+    if (grows || wanted.width != width || wanted.height != height) {
         gtk_window_resize(GTK_WINDOW(window), wanted.width, wanted.height);
         // GTK+ asks for a size once, also when the window manager has undone it since.
         gdk_window_resize(gtk_widget_get_window(window), wanted.width, wanted.height);
@@ -282,7 +288,7 @@ static gboolean cb_turned(gpointer data)
     kept(window)->tries = 0;
     if (GTK_IS_DIALOG(window))
         fit_content(window);
-    fit_window(window);
+    fit_window(window, UNTOLD);
     return FALSE;
 }
 
@@ -303,15 +309,15 @@ static GdkFilterReturn cb_root_event(GdkXEvent *xevent, GdkEvent *, gpointer win
 
 static gboolean cb_mapped(GtkWidget *window, GdkEvent *, gpointer)
 {
-    fit_window(window);
+    fit_window(window, UNTOLD);
     if (kept(window)->content != nullptr)
         reveal_focus(window);
     return FALSE;
 }
 
 // A window manager that is still placing the window may undo the size, and one that refuses it must
-// not be asked for ever.
-static void fit_size(GtkWidget *window)
+// not be asked for ever. GTK+ gives a larger size up when it is told of one from before.
+static void fit_size(GtkWidget *window, GtkRequisition told)
 {
     const GtkRequisition largest = largest_size(window);
     kept_window *of = kept(window);
@@ -320,15 +326,21 @@ static void fit_size(GtkWidget *window)
     if (!gtk_widget_get_mapped(window))
         return;
     shown_size(window, &width, &height);
-    if (width <= largest.width && height <= largest.height)
+
+    const gboolean grows =
+        MIN(width, told.width) < of->growing.width || MIN(height, told.height) < of->growing.height;
+
+    if (width <= largest.width && height <= largest.height && !grows) {
         of->tries = 0;
-    else if (of->tries++ < MAX_TRIES)
-        fit_window(window);
+        of->growing = {0, 0};
+    } else if (of->tries++ < MAX_TRIES) {
+        fit_window(window, told);
+    }
 }
 
-static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *, gpointer)
+static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *event, gpointer)
 {
-    fit_size(window);
+    fit_size(window, {event->width, event->height});
     return FALSE;
 }
 
@@ -336,7 +348,7 @@ static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *, gpointer)
 static gboolean cb_property(GtkWidget *window, GdkEventProperty *event, gpointer)
 {
     if (event->atom == gdk_atom_intern("_NET_FRAME_EXTENTS", FALSE))
-        fit_size(window);
+        fit_size(window, UNTOLD);
     return FALSE;
 }
 
