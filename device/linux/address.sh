@@ -32,6 +32,13 @@ while_for() {
     done
 }
 
+# lacks_lease: whether the interface has an address that dhclient has not written down.
+lacks_lease() {
+    leased=$(ip -4 -o address show dev "$interface" scope global 2>/dev/null |
+        sed -n 's/.* inet \([0-9.]*\).*/\1/p;q')
+    [ -n "$leased" ] && ! grep -qF "fixed-address $leased;" "$state/dhclient.leases" 2>/dev/null
+}
+
 # release_lease: gives the lease back while the network is there.
 release_lease() {
     runs dhcp.pid || return 0
@@ -49,7 +56,9 @@ release_lease() {
         kill -ALRM "$pid" 2>/dev/null
         while_for 100 runs dhcp.pid
         ;;
+    # It knows from its file what to give back, and writes it a moment after it has set the address.
     dhclient)
+        while_for 50 lacks_lease
         limited 10 dhclient -4 -r -lf "$state/dhclient.leases" -pf "$state/dhclient.pid" \
             "$interface" >/dev/null 2>&1
         ;;
