@@ -182,9 +182,9 @@ def test_busybox_is_enough():
     assert wait_for(lambda: clients() and alive(clients()[-1]))
     assert run("lnk-ifdown", "wlan0", wrap=wrap) == (0, b"", b"")
     assert not alive(clients()[-1]) and running() == []
-    assert run("wireless-lan-auto", "--now", "wlan0", wrap=wrap)[0] == 0
+    assert run("wireless-lan-auto", "--now", "wlan0", wrap=wrap) == (0, b"", b"")
     assert wait_for(running)
-    assert run("wireless-lan-auto", "--stop", "wlan0", wrap=wrap)[0] == 0
+    assert run("wireless-lan-auto", "--stop", "wlan0", wrap=wrap) == (0, b"", b"")
     assert running() == []
 
 
@@ -317,6 +317,17 @@ def test_disconnect_is_not_undone():
     assert running() == []
     assert run("wireless-lan-auto", "--now", "wlan0") == (0, b"", b"")
     assert wait_for(running) and names() == ["Home", "Market"]
+
+
+def test_it_is_asked_while_it_wakes():
+    """Its sleep has ended when it is to be ended."""
+    process = begin(HOME)
+    assert run("lnk-ifdown", "wlan0")[0] == 0
+    late = ["strace", "-qq", "-o", "/dev/null", "-e", "trace=kill",
+            "-e", "inject=kill:delay_enter=3000000"]
+    assert run("wireless-lan-auto", "--now", "wlan0", wrap=late) == (0, b"", b"")
+    assert wait_for(running)
+    ticks(process)
 
 
 def test_after_a_disconnect_it_begins_with_the_next_card():
