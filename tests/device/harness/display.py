@@ -11,9 +11,12 @@ from Xlib import X
 from probe import Screen
 from support.png import save_png
 
+WINDOW_MANAGERS = {True: ["openbox", "--sm-disable"], "blackbox": ["blackbox"]}
+
 
 class Display(Screen):
     def __init__(self, directory, size="1024x768", window_manager=True):
+        """`window_manager`: one of WINDOW_MANAGERS, or False for none."""
         self._processes = []
         self._log = open(os.path.join(directory, "display.log"), "wb")
         reading, writing = os.pipe()
@@ -28,7 +31,7 @@ class Display(Screen):
         if window_manager:
             environment = {"PATH": os.environ["PATH"], "DISPLAY": self.name, "HOME": directory,
                            "XDG_CONFIG_HOME": directory, "XDG_CACHE_HOME": directory, "LANG": "C"}
-            self._start(["openbox", "--sm-disable"], env=environment)
+            self._start(WINDOW_MANAGERS[window_manager], env=environment)
             self.wait_window_manager()
 
     def _start(self, command, **more):
