@@ -14,7 +14,7 @@ constexpr gint FRAME_ALLOWANCE = 64;
 
 constexpr gint MAX_TRIES = 20;
 
-constexpr GtkRequisition UNTOLD = {G_MAXINT, G_MAXINT};
+constexpr GtkRequisition UNTOLD = {G_MAXINT, G_MAXINT}; // GTK+ is being told no size
 
 constexpr char KEPT_KEY[] = "kept-in-work-area";
 
