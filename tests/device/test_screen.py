@@ -112,6 +112,9 @@ def test_the_screen_turns_while_it_runs(device, manager):
 
     for width, height in ((480, 272), (320, 480), (800, 480)):
         turn(width, height)
+        # A smaller one fits already.
+        wait_until(lambda: app.tree()["frame"] == [0, 0, width, height],
+                   lambda: app.tree()["frame"])
         fits(app)
         assert steady(app)["frame"] == [0, 0, width, height]
     app.press("button-wifi-settings")
