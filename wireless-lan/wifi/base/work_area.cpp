@@ -14,7 +14,7 @@ constexpr gint FRAME_ALLOWANCE = 64;
 
 constexpr gint MAX_TRIES = 20;
 
-constexpr GtkRequisition UNTOLD = {G_MAXINT, G_MAXINT}; // GTK+ is being told no size
+constexpr GtkRequisition NO_REPORT = {G_MAXINT, G_MAXINT};
 
 constexpr char KEPT_KEY[] = "kept-in-work-area";
 
@@ -142,8 +142,9 @@ static GtkRequisition fitting_size(GtkWidget *window, gint width, gint height)
     return {MIN(width, largest.width), MIN(height, largest.height)};
 }
 
-// Makes a window that is shown fit. `told` is the size that GTK+ is being told.
-static void fit_window(GtkWidget *window, GtkRequisition told)
+// Makes a window that is shown fit. `reported` is the size in a configure event that GTK+ handles
+// next, or NO_REPORT.
+static void fit_window(GtkWidget *window, GtkRequisition reported)
 {
     const GdkRectangle area = work_area(gtk_widget_get_screen(window));
     GdkRectangle frame;
@@ -154,7 +155,7 @@ static void fit_window(GtkWidget *window, GtkRequisition told)
 
     const GtkRequisition wanted = fitting_size(window, width, height);
     const gboolean grows =
-        MIN(width, told.width) < wanted.width || MIN(height, told.height) < wanted.height;
+        MIN(width, reported.width) < wanted.width || MIN(height, reported.height) < wanted.height;
 
     kept(window)->growing = grows ? wanted : GtkRequisition{0, 0};
     frame.width += wanted.width - width;
@@ -288,7 +289,7 @@ static gboolean cb_turned(gpointer data)
     kept(window)->tries = 0;
     if (GTK_IS_DIALOG(window))
         fit_content(window);
-    fit_window(window, UNTOLD);
+    fit_window(window, NO_REPORT);
     return FALSE;
 }
 
@@ -309,15 +310,15 @@ static GdkFilterReturn cb_root_event(GdkXEvent *xevent, GdkEvent *, gpointer win
 
 static gboolean cb_mapped(GtkWidget *window, GdkEvent *, gpointer)
 {
-    fit_window(window, UNTOLD);
+    fit_window(window, NO_REPORT);
     if (kept(window)->content != nullptr)
         reveal_focus(window);
     return FALSE;
 }
 
 // A window manager that is still placing the window may undo the size, and one that refuses it must
-// not be asked for ever. GTK+ gives a larger size up when it is told of one from before.
-static void fit_size(GtkWidget *window, GtkRequisition told)
+// not be asked for ever. When an older size is reported, GTK+ drops its request for a larger one.
+static void fit_size(GtkWidget *window, GtkRequisition reported)
 {
     const GtkRequisition largest = largest_size(window);
     kept_window *of = kept(window);
@@ -327,14 +328,16 @@ static void fit_size(GtkWidget *window, GtkRequisition told)
         return;
     shown_size(window, &width, &height);
 
-    const gboolean grows =
-        MIN(width, told.width) < of->growing.width || MIN(height, told.height) < of->growing.height;
+    const gboolean grows = MIN(width, reported.width) < of->growing.width ||
+                           MIN(height, reported.height) < of->growing.height;
 
     if (width <= largest.width && height <= largest.height && !grows) {
         of->tries = 0;
         of->growing = {0, 0};
     } else if (of->tries++ < MAX_TRIES) {
-        fit_window(window, told);
+        fit_window(window, reported);
+    } else {
+        of->growing = {0, 0};
     }
 }
 
@@ -348,7 +351,7 @@ static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *event, gpoin
 static gboolean cb_property(GtkWidget *window, GdkEventProperty *event, gpointer)
 {
     if (event->atom == gdk_atom_intern("_NET_FRAME_EXTENTS", FALSE))
-        fit_size(window, UNTOLD);
+        fit_size(window, NO_REPORT);
     return FALSE;
 }
 
