@@ -42,10 +42,13 @@ class Display(Screen):
 
     @contextlib.contextmanager
     def window_manager_asleep(self):
-        """Meanwhile it answers nothing; what it is asked waits."""
-        self._processes[1].send_signal(signal.SIGSTOP)
-        yield
-        self._processes[1].send_signal(signal.SIGCONT)
+        """Stops it; its events are handled when it goes on."""
+        manager = self._processes[1]
+        manager.send_signal(signal.SIGSTOP)
+        try:
+            yield
+        finally:
+            manager.send_signal(signal.SIGCONT)
 
     def screenshot(self, path):
         """Saves what the screen shows as a PNG file; gives the path."""
