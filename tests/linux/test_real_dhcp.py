@@ -247,6 +247,26 @@ def test_lease_is_given_back(far):
         process.wait(20)
 
 
+@pytest.mark.skipif("dhclient" not in REAL_CLIENTS, reason="this release has no dhclient")
+def test_lease_that_dhclient_has_not_written_yet_is_given_back(far, tmp_path):
+    """It has set the address and is still in its script."""
+    hook = "/etc/dhcp/dhclient-exit-hooks.d/wait"
+    serve(far, "10.7.0")
+    install_client("dhclient")
+    write(hook, f'[ "$reason" != BOUND ] || until [ -e {tmp_path}/go ]; do sleep 0.1; done\n')
+    try:
+        assert run("lnk-ifup", "wlan0")[0] == 0
+        assert b"lease {" not in read(f"{machine.STATE}/dhclient.leases")
+        leaving = start("lnk-ifdown", "wlan0")
+        # A release without a lease takes less than this; it waits for one for five seconds.
+        assert not wait_for(lambda: leaving.poll() is not None, limit=1)
+        write(f"{tmp_path}/go", "")
+        assert leaving.wait(60) == 0
+    finally:
+        os.remove(hook)
+    assert wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"))
+
+
 @pytest.mark.parametrize("hangs", (False, True), ids=("ends", "hangs"))
 @pytest.mark.parametrize("name", REAL_CLIENTS)
 def test_client_of_somebody_else_is_ended(name, hangs, server):
