@@ -17,8 +17,9 @@ NOBODY = "WIRELESS-LAN-DEBUG: AP MAC[]:Disconnected\n"
 
 def install(d, script):
     """The device's command that tells the access point; it notes what it is asked."""
-    d.write(AP_ADDRESS, f"#!/bin/sh\necho \"$*\" >>/device/state/asked\n{script}\n")
-    d.sh(f"chmod 755 {AP_ADDRESS}")
+    # Moved into its place: the program may be about to run the former one.
+    d.write(f"{AP_ADDRESS}.new", f"#!/bin/sh\necho \"$*\" >>/device/state/asked\n{script}\n")
+    d.sh(f"chmod 755 {AP_ADDRESS}.new && mv {AP_ADDRESS}.new {AP_ADDRESS}")
 
 
 def refuse(d, error):
