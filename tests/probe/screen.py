@@ -11,6 +11,7 @@ from Xlib.protocol import event
 from .wait import wait_until
 
 CHANGE_PROPERTY = 18
+BUTTONS = X.Button1Mask | X.Button2Mask | X.Button3Mask | X.Button4Mask | X.Button5Mask
 
 
 class Screen:
@@ -153,7 +154,15 @@ class Screen:
         return list(area.value[:4]) if area else [0, 0, self.width, self.height]
 
     # Pointer and keys.
+    def _let_go(self):
+        """Until the last press has been passed on. A window manager may hold it back while it
+        brings the window to the front; it then takes place where the pointer is by that time, and
+        keys overtake it."""
+        wait_until(lambda: not self.root.query_pointer().mask & BUTTONS,
+                   "the last press to be passed on")
+
     def move(self, x, y):
+        self._let_go()
         xtest.fake_input(self._x, X.MotionNotify, x=int(x), y=int(y))
         self._x.sync()
 
@@ -175,6 +184,7 @@ class Screen:
         names = {"ctrl": "Control_L", "alt": "Alt_L", "shift": "Shift_L"}
         parts = [names.get(part, part) for part in combination.split("+")]
         codes = [self._code(XK.string_to_keysym(part))[0] for part in parts]
+        self._let_go()
         for code in codes:
             xtest.fake_input(self._x, X.KeyPress, code)
         for code in reversed(codes):
@@ -184,6 +194,7 @@ class Screen:
     def type(self, text):
         """Types a text; what has no key of its own goes by its number, as GTK+ takes it."""
         shift = self._code(XK.XK_Shift_L)[0]
+        self._let_go()
         for character in text:
             if not " " <= character <= "~":
                 self.key("ctrl+shift+u")
