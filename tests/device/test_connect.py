@@ -218,7 +218,7 @@ def test_two_disconnects_at_once(device):
 
 def test_preconditions(device):
     d, app = idle(device, "one")
-    windows = len(app.windows())
+    windows = app.window_count()
 
     # Nothing selected.
     app.press("button-connect")
@@ -235,7 +235,7 @@ def test_preconditions(device):
     app.press("button-connect")
     app.wait_printed("Choice to Connect index[0],count[1]\n")
     settle(app)
-    assert app.dialogs() == [] and len(app.windows()) == windows
+    assert app.dialogs() == [] and app.window_count() == windows
     assert settle(app) == IDLE and app.sensitive("button-connect")
 
     # No network in the list.
@@ -249,14 +249,14 @@ def test_preconditions(device):
     assert [one["label"] for one in notice.all(type="GtkButton")] == ["gtk-close"]
     notice.press("gtk-close")
     notice.wait_gone()
-    assert len(app.windows()) == windows
+    assert app.window_count() == windows
     assert d.commands("iwset") == [] and d.states() == [5, 5]
     assert settle(app) == IDLE
 
 
 def test_hidden_names(device):
     d, app = idle(device, ("", "off"), ("", "on"), "cafe")
-    windows = len(app.windows())
+    windows = app.window_count()
     connect(app, 0)
     question = app.dialog(text=HIDDEN)
     assert sorted(one["label"] for one in question.all(type="GtkButton")) == ["gtk-no", "gtk-yes"]
@@ -271,7 +271,7 @@ def test_hidden_names(device):
     assert f"input essid = {name} \n" in app.stdout()
     assert app.networks()[0][0] == name
     assert d.file("/tmp/x") is None
-    assert len(app.windows()) == windows
+    assert app.window_count() == windows
     arrive(d, app, 0)
 
     # Enter is Yes. What follows knows the name: the key is asked for.
@@ -370,7 +370,7 @@ def test_files_for_scripts_are_made_anew(device):
 
 def test_a_cancelled_key_leaves_no_trace(device):
     d, app = idle(device, ("home", "on"), "cafe")
-    windows = len(app.windows())
+    windows = app.window_count()
     for leave in ("gtk-cancel", "Escape"):
         connect(app, 0)
         dialog = app.dialog("Encrypted Network")
@@ -382,7 +382,7 @@ def test_a_cancelled_key_leaves_no_trace(device):
         dialog.wait_gone()
         assert settle(app) == IDLE and app.sensitive("button-connect")
         assert [row[4] for row in app.networks()] == ["Disconnect", "Disconnect"]
-        assert len(app.windows()) == windows
+        assert app.window_count() == windows
         for key in ("connect_key", "Authentication_ComboBox", "Key_Index_ComboBox"):
             assert app.registry(key) is None
     assert d.commands("iwset") == [] and d.states() == [5]

@@ -329,6 +329,11 @@ class Program(Pane):
         """All top-level windows, shown or not."""
         return [_widget(window) for window in self.ask("tree")]
 
+    def window_count(self):
+        """How many top-level windows there are, shown or not. GTK+'s own for tooltips is left out:
+        it begins to exist when the pointer first moves over a widget that has one."""
+        return len([one for one in self.windows() if one["name"] != "gtk-tooltip"])
+
     def sketch(self):
         """What is on the screen, to be read."""
         return "\n".join(one.sketch() for one in self.windows() if one["visible"])
