@@ -88,6 +88,7 @@ def program(shared_device):
 
 @pytest.fixture
 def app(program):
-    """The same; what a test leaves open is closed after it."""
+    """The same; what a test leaves open is closed after it, and what it began comes to its end."""
     yield program
     close_dialogs(program)
+    program.device.wait_commands_ended()

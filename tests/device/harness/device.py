@@ -310,6 +310,12 @@ class Device:
                 and found[count - 1]
         return wait_until(there, lambda: f"{name} {count} times in {self.commands()}", limit)
 
+    def wait_commands_ended(self):
+        """Until none runs that the program has left to init, a begun one included that the log does
+        not show yet."""
+        wait_until(lambda: len(child_ids(self.init)) == 1,
+                   lambda: f"the commands to end: {self.commands()}")
+
     # What the desktop is told.
     def notices(self):
         """(name, text) of every notice on the root window so far, in order."""
