@@ -51,10 +51,13 @@ release_lease() {
         kill -USR2 "$pid" 2>/dev/null
         while_for 20 has_address
         ;;
-    # It leaves after the message.
+    # It leaves after the message. A signal that comes while its script is running is lost.
     dhcpcd)
-        kill -ALRM "$pid" 2>/dev/null
-        while_for 100 runs dhcp.pid
+        for _ in 1 2 3 4 5 6 7 8 9 10; do
+            runs dhcp.pid || break
+            kill -ALRM "$pid" 2>/dev/null
+            while_for 10 runs dhcp.pid
+        done
         ;;
     # It knows from its file what to give back, and writes it a moment after it has set the address.
     dhclient)

@@ -267,6 +267,31 @@ def test_lease_that_dhclient_has_not_written_yet_is_given_back(far, tmp_path):
     assert wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"))
 
 
+@pytest.mark.skipif("dhcpcd" not in REAL_CLIENTS, reason="no dhcpcd")
+def test_lease_is_given_back_by_a_dhcpcd_in_its_script(far, tmp_path):
+    """It hears no signal meanwhile; and it is not disturbed while it says that it leaves."""
+    hook = "/etc/dhcpcd.exit-hook"
+    serve(far, "10.7.0")
+    install_client("dhcpcd")
+    write(hook, f'''
+        echo "$reason" >>{tmp_path}/reasons
+        [ "$reason" != BOUND ] || until [ -e {tmp_path}/go ]; do sleep 0.1; done
+        [ "$reason" != STOP ] || sleep 2.5
+        ''')
+    try:
+        assert run("lnk-ifup", "wlan0")[0] == 0
+        assert wait_for(lambda: b"BOUND\n" in read(f"{tmp_path}/reasons"))
+        leaving = start("lnk-ifdown", "wlan0")
+        # Until the first signal is lost.
+        assert not wait_for(lambda: leaving.poll() is not None, limit=1)
+        write(f"{tmp_path}/go", "")
+        assert leaving.wait(60) == 0
+    finally:
+        os.remove(hook)
+    assert wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"))
+    assert read(f"{tmp_path}/reasons").endswith(b"BOUND\nSTOP\nSTOPPED\n")
+
+
 @pytest.mark.parametrize("hangs", (False, True), ids=("ends", "hangs"))
 @pytest.mark.parametrize("name", REAL_CLIENTS)
 def test_client_of_somebody_else_is_ended(name, hangs, server):
