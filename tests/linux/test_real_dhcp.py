@@ -247,49 +247,47 @@ def test_lease_is_given_back(far):
         process.wait(20)
 
 
-@pytest.mark.skipif("dhclient" not in REAL_CLIENTS, reason="this release has no dhclient")
-def test_lease_that_dhclient_has_not_written_yet_is_given_back(far, tmp_path):
-    """It has set the address and is still in its script."""
-    hook = "/etc/dhcp/dhclient-exit-hooks.d/wait"
+def leave_during_script(far, name, hook, go, begun):
+    """lnk-ifdown, while the script for the lease is running; `hook`, which it runs, waits for the
+    file `go`. The lease is given back all the same."""
     serve(far, "10.7.0")
-    install_client("dhclient")
-    write(hook, f'[ "$reason" != BOUND ] || until [ -e {tmp_path}/go ]; do sleep 0.1; done\n')
+    install_client(name)
+    write(*hook)
     try:
         assert run("lnk-ifup", "wlan0")[0] == 0
-        assert b"lease {" not in read(f"{machine.STATE}/dhclient.leases")
+        assert wait_for(begun)
         leaving = start("lnk-ifdown", "wlan0")
-        # A release without a lease takes less than this; it waits for one for five seconds.
+        # It is still at it: the client has been told, or is about to be.
         assert not wait_for(lambda: leaving.poll() is not None, limit=1)
-        write(f"{tmp_path}/go", "")
+        write(go, "")
         assert leaving.wait(60) == 0
     finally:
-        os.remove(hook)
+        os.remove(hook[0])
     assert wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"))
+
+
+@pytest.mark.skipif("dhclient" not in REAL_CLIENTS, reason="this release has no dhclient")
+def test_lease_that_dhclient_has_not_written_yet_is_given_back(far, tmp_path):
+    """It has set the address. A release without a lease would take less than a second; this one
+    waits for it."""
+    go = tmp_path / "go"
+    hook = f'[ "$reason" != BOUND ] || until [ -e {go} ]; do sleep 0.1; done\n'
+    leave_during_script(far, "dhclient", ("/etc/dhcp/dhclient-exit-hooks.d/wait", hook), go,
+                        lambda: b"lease {" not in read(f"{machine.STATE}/dhclient.leases"))
 
 
 @pytest.mark.skipif("dhcpcd" not in REAL_CLIENTS, reason="no dhcpcd")
 def test_lease_is_given_back_by_a_dhcpcd_in_its_script(far, tmp_path):
     """It hears no signal meanwhile; and it is not disturbed while it says that it leaves."""
-    hook = "/etc/dhcpcd.exit-hook"
-    serve(far, "10.7.0")
-    install_client("dhcpcd")
-    write(hook, f'''
-        echo "$reason" >>{tmp_path}/reasons
-        [ "$reason" != BOUND ] || until [ -e {tmp_path}/go ]; do sleep 0.1; done
+    go, reasons = tmp_path / "go", tmp_path / "reasons"
+    hook = f'''
+        echo "$reason" >>{reasons}
+        [ "$reason" != BOUND ] || until [ -e {go} ]; do sleep 0.1; done
         [ "$reason" != STOP ] || sleep 2.5
-        ''')
-    try:
-        assert run("lnk-ifup", "wlan0")[0] == 0
-        assert wait_for(lambda: b"BOUND\n" in read(f"{tmp_path}/reasons"))
-        leaving = start("lnk-ifdown", "wlan0")
-        # Until the first signal is lost.
-        assert not wait_for(lambda: leaving.poll() is not None, limit=1)
-        write(f"{tmp_path}/go", "")
-        assert leaving.wait(60) == 0
-    finally:
-        os.remove(hook)
-    assert wait_for(lambda: b"10.7.0." not in read(f"{machine.ROOT}/leases"))
-    assert read(f"{tmp_path}/reasons").endswith(b"BOUND\nSTOP\nSTOPPED\n")
+        '''
+    leave_during_script(far, "dhcpcd", ("/etc/dhcpcd.exit-hook", hook), go,
+                        lambda: b"BOUND\n" in read(reasons))
+    assert read(reasons).endswith(b"BOUND\nSTOP\nSTOPPED\n")
 
 
 @pytest.mark.parametrize("hangs", (False, True), ids=("ends", "hangs"))
