@@ -19,9 +19,23 @@ CONTAINERS = ("split pane", "scroll pane", "table cell")
 ANNOUNCEMENTS = ("object:text-changed:insert", "object:property-change:accessible-name")
 
 
+def wait_heard(condition, what):
+    """Waits for an answer of the program; what is asked about may go while it is asked."""
+    def asked():
+        with contextlib.suppress(GLib.Error):
+            return condition()
+        return None
+    return wait_until(asked, what)
+
+
+def called(one):
+    """Its name; None where there is nothing any more."""
+    return one and one.get_name()
+
+
 def spoken(one):
     """What a screen reader calls a control: its label, else its name."""
-    labels = [relation.get_target(0).get_name() for relation in one.get_relation_set()
+    labels = [called(relation.get_target(0)) or "" for relation in one.get_relation_set()
               if relation.get_relation_type() == Atspi.RelationType.LABELLED_BY]
     return " ".join(labels + [one.get_name()] * (not labels)).strip()
 
@@ -51,7 +65,7 @@ def walk(one):
 def row(table, number):
     """The texts of a row of a list."""
     grid = table.get_table_iface()
-    return [grid.get_accessible_at(number, column).get_name()
+    return [called(grid.get_accessible_at(number, column))
             for column in range(grid.get_n_columns())]
 
 
@@ -62,7 +76,7 @@ def selected(table):
 
 def value(combo):
     """The item that a combo box shows."""
-    return combo.get_selection_iface().get_selected_child(0).get_name()
+    return called(combo.get_selection_iface().get_selected_child(0))
 
 
 class Reader:
@@ -119,7 +133,7 @@ class Reader:
                 pass
             return [[text for kind, source, text in self.heard if kind == one and
                      role(source) == "status bar"] for one in ANNOUNCEMENTS]
-        wait_until(lambda: all(len(one) >= len(texts) for one in heard()),
+        wait_heard(lambda: all(len(one) >= len(texts) for one in heard()),
                    lambda: f"{texts} to be announced; heard was {self.heard}")
         assert heard() == [list(texts)] * len(ANNOUNCEMENTS)
         self.heard.clear()
@@ -129,29 +143,21 @@ class Reader:
         return [window for program in children(self._desktop) for window in children(program)
                 if window.get_state_set().contains(Atspi.StateType.SHOWING)]
 
-    def seek(self, window, name, kind):
-        """The control of that name in a window, or None."""
-        for one in walk(window):
-            # It may go while it is asked.
-            with contextlib.suppress(GLib.Error):
-                if role(one) == kind and spoken(one) == name:
-                    return one
-        return None
-
     def find(self, window, name, kind):
-        return wait_until(lambda: self.seek(window, name, kind), lambda: f"{kind} {name!r}")
+        """The control of that name in a window."""
+        return wait_heard(lambda: next((one for one in walk(window) if role(one) == kind and
+                                        spoken(one) == name), None), lambda: f"{kind} {name!r}")
 
     def window(self, name):
         """The window of that name, once it has the keyboard."""
         def there():
-            with contextlib.suppress(GLib.Error):
-                return next((one for one in self.windows() if one.get_name() == name and
-                             one.get_state_set().contains(Atspi.StateType.ACTIVE)), None)
-        return wait_until(there, lambda: f"the window {name!r} to be active; there are "
+            return next((one for one in self.windows() if one.get_name() == name and
+                         one.get_state_set().contains(Atspi.StateType.ACTIVE)), None)
+        return wait_heard(there, lambda: f"the window {name!r} to be active; there are "
                           f"{[one.get_name() for one in self.windows()]}")
 
     def wait_gone(self, name):
-        wait_until(lambda: name not in [one.get_name() for one in self.windows()],
+        wait_heard(lambda: name not in [one.get_name() for one in self.windows()],
                    lambda: f"the window {name!r} to go")
 
     def nameless(self, window):
@@ -160,8 +166,7 @@ class Reader:
         for one in walk(window):
             if role(one) == "combo box":
                 # The toolkit calls one without a name by its item.
-                item = one.get_selection_iface().get_selected_child(0)
-                named = spoken(one) not in ("", item and item.get_name())
+                named = spoken(one) not in ("", value(one))
             else:
                 named = role(one) in CONTAINERS or spoken(one) or \
                     not one.get_state_set().contains(Atspi.StateType.FOCUSABLE)
@@ -172,21 +177,18 @@ class Reader:
     # The keyboard.
     def focus(self, window):
         """(name, role) of the control that has the keyboard; a list's cell keeps its own mark."""
-        with contextlib.suppress(GLib.Error):
-            for one in walk(window):
-                if one.get_state_set().contains(Atspi.StateType.FOCUSED) and \
-                        role(one) != "table cell":
-                    return spoken(one), role(one)
-        return None
+        return next(((spoken(one), role(one)) for one in walk(window)
+                     if one.get_state_set().contains(Atspi.StateType.FOCUSED) and
+                     role(one) != "table cell"), None)
 
     def go(self, window, name, kind):
         """Presses Tab until a control of that name has the keyboard. Every stop has a name."""
-        stops = [wait_until(lambda: self.focus(window), "a focus")]
+        stops = [wait_heard(lambda: self.focus(window), "a focus")]
         while stops[-1] != (name, kind):
             assert stops[-1] not in stops[:-1], f"{kind} {name!r} is not among {stops}"
             assert stops[-1][0], f"a stop has no name: {stops}"
             self.device.display.key("Tab")
-            stops.append(wait_until(
+            stops.append(wait_heard(
                 lambda: self.focus(window) not in (None, stops[-1]) and self.focus(window),
                 lambda: f"the focus to leave {stops[-1]}"))
 
@@ -200,5 +202,5 @@ class Reader:
         self.device.display.key("ctrl+a")
         self.device.display.type(text)
         entry = self.find(window, name, kind)
-        wait_until(lambda: entry.get_character_count() == len(text),
+        wait_heard(lambda: entry.get_character_count() == len(text),
                    lambda: f"{text!r} in the entry {name!r}")

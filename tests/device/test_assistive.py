@@ -9,7 +9,6 @@ import pytest
 
 from connecting import CONNECTING, ACQUIRING, COMMANDS, IDLE, address_of, connected, pass_time, \
     poll_address, poll_link
-from harness import wait_until
 from preferred import FILE, Network, file_of
 from settings_page import ADDRESSES, CONF, static
 from support.grammar import scan_text
@@ -20,7 +19,8 @@ BRIDGE = "/usr/lib/*/gtk-2.0/modules/libatk-bridge.so"
 if not glob.glob(BRIDGE):
     pytest.skip("left out: libatk-adaptor has no bridge for GTK+ 2 here", allow_module_level=True)
 
-from screen_reader import Reader, row, selected, value, walk  # pylint: disable=wrong-import-position
+from screen_reader import (  # pylint: disable=wrong-import-position
+    Reader, row, selected, value, wait_heard, walk)
 
 # "get_..." in place of "get_..._iface" finds nothing in the client of Debian 12.
 pytestmark = pytest.mark.filterwarnings("ignore:Atspi:DeprecationWarning")
@@ -76,7 +76,7 @@ def test_connect_with_a_key(reader, window):
     networks = reader.find(window, "Wireless network selection", "table")
     for name in ("open net", "home net"):
         d.display.key("Down")
-        wait_until(lambda: [one[0] for one in selected(networks)] == [name],
+        wait_heard(lambda: [one[0] for one in selected(networks)] == [name],
                    lambda: f"{name} to be selected, which is {selected(networks)}")
     reader.heard.clear()
     d.display.key("Return")
@@ -85,7 +85,7 @@ def test_connect_with_a_key(reader, window):
     assert dialog.get_description() == "home net"
     assert reader.nameless(dialog) == []
     assert "icon" not in roles(dialog) and "image" not in roles(dialog)
-    assert reader.focus(dialog) == ("Key", "text")
+    wait_heard(lambda: reader.focus(dialog) == ("Key", "text"), "the key's entry")
     assert reader.find(dialog, "Key index:", "combo box")
     assert reader.find(dialog, "Preferred Network", "combo box")
     reader.enter(dialog, "Key", "secret77")
@@ -93,7 +93,7 @@ def test_connect_with_a_key(reader, window):
     assert value(authentication) == "WEP"
     reader.go(dialog, "Authentication", "combo box")
     d.display.key("Down")
-    wait_until(lambda: value(authentication) == "WPA-PSK/WPA2-PSK", "the other authentication")
+    wait_heard(lambda: value(authentication) == "WPA-PSK/WPA2-PSK", "the other authentication")
     reader.press(dialog, "OK")
 
     offer = reader.window("Question")
@@ -108,7 +108,7 @@ def test_connect_with_a_key(reader, window):
     poll_link(d, app)
     d.address("192.168.7.23")
     poll_address(d, app)
-    wait_until(lambda: row(networks, 1)[-1] == connected("192.168.7.23"), "the address")
+    wait_heard(lambda: row(networks, 1)[-1] == connected("192.168.7.23"), "the address")
     assert reader.find(window, "Disconnect", "push button")
     reader.announced(CONNECTING, ACQUIRING, IDLE)
     assert b"ALIAS mine\nESSID home net\n" in d.file(FILE)
@@ -118,9 +118,10 @@ def test_a_connect_that_fails(reader, window):
     d, app = reader.device, reader.device.apps[-1]
     reader.go(window, "Wireless network selection", "table")
     networks = reader.find(window, "Wireless network selection", "table")
-    for key, name in (("Home", "open net"), ("End", "other net")):
+    # After Tab alone the row of the cursor is not selected, and a move to it does nothing.
+    for key, name in (("End", "other net"), ("Home", "open net"), ("End", "other net")):
         d.display.key(key)
-        wait_until(lambda name=name: [one[0] for one in selected(networks)] == [name], name)
+        wait_heard(lambda name=name: [one[0] for one in selected(networks)] == [name], name)
     d.dissociate()
     d.clear_commands()
     reader.heard.clear()
@@ -129,7 +130,7 @@ def test_a_connect_that_fails(reader, window):
     pass_time(d, app, 100)
     d.wait_command("iwset")
     poll_link(d, app, 21)
-    wait_until(lambda: row(networks, 2)[-1] == "Not Connect", "the end of it")
+    wait_heard(lambda: row(networks, 2)[-1] == "Not Connect", "the end of it")
     reader.announced(CONNECTING, IDLE)
 
 
@@ -143,9 +144,9 @@ def test_edit_the_preferred_list(reader, window):
     count = names.get_table_iface().get_n_rows()
     d.display.key("Home")
     d.display.key("Down")
-    wait_until(lambda: selected(names) == [["second"]], lambda: f"selected: {selected(names)}")
+    wait_heard(lambda: selected(names) == [["second"]], lambda: f"selected: {selected(names)}")
     d.display.key("alt+Up")
-    wait_until(lambda: row(names, 0) == ["second"], "the row to move up")
+    wait_heard(lambda: row(names, 0) == ["second"], "the row to move up")
     d.display.key("Return")
 
     form = reader.window("Properties")
@@ -156,7 +157,7 @@ def test_edit_the_preferred_list(reader, window):
     reader.enter(form, "Alias", "first")
     d.display.key("Return")
     reader.window("Preferred Network Setting")
-    wait_until(lambda: row(names, 0) == ["first"], "the new alias")
+    wait_heard(lambda: row(names, 0) == ["first"], "the new alias")
 
     reader.press(dialog, "Add")
     form = reader.window("Add WiFi Network")
@@ -164,11 +165,11 @@ def test_edit_the_preferred_list(reader, window):
     reader.enter(form, "ESSID", "attic")
     reader.go(form, "Encryption: WEP", "radio button")
     d.display.key("Right")
-    wait_until(lambda: reader.focus(form) == ("Encryption: WPA", "radio button"), "WPA")
+    wait_heard(lambda: reader.focus(form) == ("Encryption: WPA", "radio button"), "WPA")
     reader.enter(form, "Key", "secret88", "password text")
     reader.press(form, "OK")
     reader.window("Preferred Network Setting")
-    wait_until(lambda: names.get_table_iface().get_n_rows() == count + 1, "the added row")
+    wait_heard(lambda: names.get_table_iface().get_n_rows() == count + 1, "the added row")
     reader.press(dialog, "OK")
     reader.wait_gone("Preferred Network Setting")
     assert d.file(FILE).startswith(file_of(STORED[1]._replace(alias="first"), STORED[0]))
@@ -182,7 +183,7 @@ def test_change_the_settings(reader, window):
     assert reader.nameless(dialog) == []
     reader.go(dialog, "dhcp", "radio button")
     d.display.key("Down")
-    wait_until(lambda: reader.focus(dialog) == ("static", "radio button"), "static")
+    wait_heard(lambda: reader.focus(dialog) == ("static", "radio button"), "static")
     for name, text in zip(("Address", "Netmask", "Broadcast", "Gateway"), ADDRESSES):
         reader.enter(dialog, name, text)
     reader.press(dialog, "OK")
