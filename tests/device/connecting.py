@@ -1,6 +1,8 @@
 # SPDX-License-Identifier: MIT
 """Steps of a connect that several tests take. Time passes only when a test lets it."""
 
+from contextlib import suppress
+
 from harness import wait_until
 from preferred import FILE, Network, file_of
 from support.grammar import scan_text
@@ -136,12 +138,14 @@ def preferred(*networks):
 
 
 def children(pid):
-    """(state, command line) of every process below this one."""
+    """(state, command line) of every process below this one, but for those that end meanwhile."""
+    found = []
     with open(f"/proc/{pid}/task/{pid}/children", encoding="ascii") as numbers:
-        found = []
-        for number in numbers.read().split():
+        below = numbers.read().split()
+    for number in below:
+        with suppress(FileNotFoundError, ProcessLookupError):
             with open(f"/proc/{number}/stat", encoding="ascii") as stat, \
                     open(f"/proc/{number}/cmdline", "rb") as line:
                 found.append((stat.read().rpartition(")")[2].split()[0], line.read()))
-                found += children(number)
-        return found
+            found += children(number)
+    return found
