@@ -11,7 +11,8 @@ def missing(top):
     tools = [tool for tool in ("Xvfb", "openbox", "setpriv", "nsenter", "cc", "pkg-config")
              if not shutil.which(tool)]
     if tools:
-        return f"{', '.join(tools)}: missing; tools/set-up tools/packages tools/packages-tests"
+        return (f"{', '.join(tools)}: missing; tools/set-up && "
+                "tools/set-up tools/packages-tests")
     try:
         own = os.readlink("/proc/self") == str(os.getpid())
     except OSError:
