@@ -298,7 +298,8 @@ class Device:
         return [one for one in found if not names or one.name in names]
 
     def clear_commands(self):
-        """Forgets the commands so far."""
+        """Forgets the commands so far, those included that have begun and are not written yet."""
+        self.wait_commands_ended()
         with open(f"{self.state}/log", "wb"):
             pass
 
