@@ -148,3 +148,21 @@ def test_a_size_from_before_the_turn_is_not_kept(device):
                     d.display.set_work_area(0, 0, *size)
                     app.tree()  # once it has answered it has asked for its size
         wait_until(lambda: app.tree()["rect"][2:] == as_opened[2:], lambda: app.tree()["rect"])
+
+
+def test_a_smaller_screen_that_is_gone_again(device):
+    """The window asks a busy window manager for a smaller size, then for the one that it has."""
+    d = screen(device, (1024, 768))
+    app = screens.start(d)
+    as_opened = steady(app)["rect"]
+    for _ in range(5):
+        with d.display.window_manager_asleep():
+            for size in ((480, 272), (1024, 768)):
+                d.display.set_work_area(0, 0, *size)
+                app.tree()  # once it has answered it has asked for its size
+        # The window manager shows the dialog after it has done what the window asked for.
+        app.press("button-wifi-settings")
+        settings = app.dialog(SETTINGS)
+        settings.press("gtk-cancel")
+        settings.wait_gone()
+        wait_until(lambda: app.tree()["rect"][2:] == as_opened[2:], lambda: app.tree()["rect"])

@@ -14,6 +14,9 @@ constexpr gint FRAME_ALLOWANCE = 64;
 
 constexpr gint MAX_TRIES = 20;
 
+// How many sizes a busy window manager may still have to grant.
+constexpr gsize MAX_ASKED = 8;
+
 constexpr GtkRequisition NO_REPORT = {G_MAXINT, G_MAXINT};
 
 constexpr char KEPT_KEY[] = "kept-in-work-area";
@@ -25,6 +28,7 @@ struct kept_window {
     gint tries;             // to make it fit, one after the other
     GtkRequisition growing; // what it asks for on a larger screen, until it has it; 0: nothing
     GtkWidget *content;     // of a dialog, once it is in a scrolled window
+    GtkRequisition asked[MAX_ASKED]; // the sizes that it asked for, the last one first; 0: none
 };
 
 // Reads `count` cardinals of a root-window property from the item `offset` on.
@@ -127,6 +131,32 @@ static void cb_limit_request(GtkWidget *window, GtkRequisition *request, gpointe
     request->height = MIN(request->height, MAX(largest.height, 1));
 }
 
+static gboolean is_size(GtkRequisition size, GtkRequisition other)
+{
+    return size.width == other.width && size.height == other.height;
+}
+
+static gboolean is_smaller(GtkRequisition size, GtkRequisition than)
+{
+    return size.width < than.width || size.height < than.height;
+}
+
+static void note_asked(kept_window *of, GtkRequisition wanted)
+{
+    if (is_size(of->asked[0], wanted))
+        return;
+    memmove(&of->asked[1], &of->asked[0], sizeof of->asked - sizeof of->asked[0]);
+    of->asked[0] = wanted;
+}
+
+static gboolean was_asked(const kept_window *of, GtkRequisition size)
+{
+    for (const GtkRequisition &asked : of->asked)
+        if (is_size(asked, size))
+            return TRUE;
+    return FALSE;
+}
+
 // The size that a window has to have: what it has got, or, where a smaller screen has taken it,
 // what it asks for and opens with, within the work area.
 static GtkRequisition fitting_size(GtkWidget *window, gint width, gint height)
@@ -153,15 +183,18 @@ static void fit_window(GtkWidget *window, GtkRequisition reported)
     shown_size(window, &width, &height);
     gdk_window_get_frame_extents(gtk_widget_get_window(window), &frame);
 
+    kept_window *of = kept(window);
     const GtkRequisition wanted = fitting_size(window, width, height);
-    const gboolean grows =
-        MIN(width, reported.width) < wanted.width || MIN(height, reported.height) < wanted.height;
+    // It may have the size still and have asked for a smaller one, which is on its way.
+    const gboolean grows = is_smaller({width, height}, wanted) || is_smaller(reported, wanted) ||
+                           (of->asked[0].width > 0 && is_smaller(of->asked[0], wanted));
 
-    kept(window)->growing = grows ? wanted : GtkRequisition{0, 0};
+    of->growing = grows ? wanted : GtkRequisition{0, 0};
     frame.width += wanted.width - width;
     frame.height += wanted.height - height;
     gtk_widget_queue_resize(window);
-    if (grows || wanted.width != width || wanted.height != height) {
+    if (grows || !is_size(wanted, {width, height})) {
+        note_asked(of, wanted);
         gtk_window_resize(GTK_WINDOW(window), wanted.width, wanted.height);
         // GTK+ asks for a size once, also when the window manager has undone it since.
         gdk_window_resize(gtk_widget_get_window(window), wanted.width, wanted.height);
@@ -328,8 +361,8 @@ static void fit_size(GtkWidget *window, GtkRequisition reported)
         return;
     shown_size(window, &width, &height);
 
-    const gboolean grows = MIN(width, reported.width) < of->growing.width ||
-                           MIN(height, reported.height) < of->growing.height;
+    const gboolean grows =
+        is_smaller({width, height}, of->growing) || is_smaller(reported, of->growing);
 
     if (width <= largest.width && height <= largest.height && !grows) {
         of->tries = 0;
@@ -343,7 +376,13 @@ static void fit_size(GtkWidget *window, GtkRequisition reported)
 
 static gboolean cb_configured(GtkWidget *window, GdkEventConfigure *event, gpointer)
 {
-    fit_size(window, {event->width, event->height});
+    kept_window *of = kept(window);
+    const GtkRequisition reported = {event->width, event->height};
+
+    // It comes late when a larger one has been asked for since.
+    if (was_asked(of, reported) && is_smaller(reported, of->asked[0]))
+        of->growing = of->asked[0];
+    fit_size(window, reported);
     return FALSE;
 }
 
