@@ -3,6 +3,7 @@
 
 import json
 import os
+import subprocess
 
 import pytest
 
@@ -165,3 +166,45 @@ def test_a_smaller_screen_that_is_gone_again(device):
             d.display.wait_window_manager_done()
             app.tree()
         wait_until(lambda: app.tree()["rect"][2:] == as_opened[2:], lambda: app.tree()["rect"])
+
+
+# A window that loses ten pixels after a look at its frame, twice.
+SHRINKING = r"""
+#define _GNU_SOURCE
+#include <dlfcn.h>
+#include <unistd.h>
+
+void gdk_window_get_frame_extents(void *window, void *frame)
+{
+    static int width = -1;
+    void (*next)(void *, void *) = dlsym(RTLD_NEXT, "gdk_window_get_frame_extents");
+    void (*resize)(void *, int, int) = dlsym(RTLD_DEFAULT, "gdk_window_resize");
+    void (*flush)(void) = dlsym(RTLD_DEFAULT, "gdk_flush");
+
+    next(window, frame);
+    if (unlink("/device/state/shrink") == 0)
+        width = 800;
+    if (width > 780) {
+        width -= 10;
+        resize(window, width, 480);
+        flush();
+        (void)!write(2, "shrunk\n", 7);
+    }
+}
+"""
+
+
+def test_a_window_that_is_resized_while_it_is_measured(device):
+    d = screen(device, (1024, 768), window_manager=False)
+    source, library = f"{d.state}/shrinking.c", f"{d.state}/shrinking.so"
+    with open(source, "w", encoding="ascii") as file:
+        file.write(SHRINKING)
+    subprocess.run(["cc", "-shared", "-fPIC", "-o", library, source], check=True)
+    app = d.start(environment={"LD_PRELOAD": library})
+    app.wait_listed()
+    d.display.turn(800, 480)
+    wait_until(lambda: app.tree()["frame"] == [0, 0, 800, 480], lambda: app.tree()["frame"])
+    d.write("/device/state/shrink", "")
+    d.display.turn(700, 480)
+    wait_until(lambda: app.stderr().count("shrunk") == 2, "the window to shrink")
+    wait_until(lambda: app.tree()["frame"] == [0, 0, 700, 480], lambda: app.tree()["frame"])

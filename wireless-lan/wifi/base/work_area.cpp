@@ -86,14 +86,33 @@ static void shown_size(GtkWidget *window, gint *width, gint *height)
                             nullptr);
 }
 
+static gboolean is_size(GtkRequisition size, GtkRequisition other)
+{
+    return size.width == other.width && size.height == other.height;
+}
+
+// A window that is shown, with its frame; its own size goes to `width` and `height`. They are read
+// one after the other, and the window manager may set a size in between.
+static GdkRectangle shown_frame(GtkWidget *window, gint *width, gint *height)
+{
+    GdkRectangle frame;
+    GtkRequisition before;
+
+    shown_size(window, width, height);
+    do {
+        before = {*width, *height};
+        gdk_window_get_frame_extents(gtk_widget_get_window(window), &frame);
+        shown_size(window, width, height);
+    } while (!is_size(before, {*width, *height}));
+    return frame;
+}
+
 // The size of the frame around a window that is shown.
 static GtkRequisition frame_size(GtkWidget *window)
 {
-    GdkRectangle frame;
     gint width, height;
+    const GdkRectangle frame = shown_frame(window, &width, &height);
 
-    gdk_window_get_frame_extents(gtk_widget_get_window(window), &frame);
-    shown_size(window, &width, &height);
     return {MAX(frame.width - width, 0), MAX(frame.height - height, 0)};
 }
 
@@ -129,11 +148,6 @@ static void cb_limit_request(GtkWidget *window, GtkRequisition *request, gpointe
     kept(window)->natural = *request;
     request->width = MIN(request->width, MAX(largest.width, 1));
     request->height = MIN(request->height, MAX(largest.height, 1));
-}
-
-static gboolean is_size(GtkRequisition size, GtkRequisition other)
-{
-    return size.width == other.width && size.height == other.height;
 }
 
 static gboolean is_smaller(GtkRequisition size, GtkRequisition than)
@@ -177,12 +191,8 @@ static GtkRequisition fitting_size(GtkWidget *window, gint width, gint height)
 static void fit_window(GtkWidget *window, GtkRequisition reported)
 {
     const GdkRectangle area = work_area(gtk_widget_get_screen(window));
-    GdkRectangle frame;
     gint width, height;
-
-    shown_size(window, &width, &height);
-    gdk_window_get_frame_extents(gtk_widget_get_window(window), &frame);
-
+    GdkRectangle frame = shown_frame(window, &width, &height);
     kept_window *of = kept(window);
     const GtkRequisition wanted = fitting_size(window, width, height);
     // It may have the size still and have asked for a smaller one, which is on its way.
