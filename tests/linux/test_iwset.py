@@ -1,6 +1,7 @@
 # SPDX-License-Identifier: MIT
 """iwset: what the supplicant is given, what is refused, what is left, and that no key leaks."""
 
+import contextlib
 import glob
 import hashlib
 import os
@@ -346,9 +347,16 @@ def test_no_program_is_given_a_key(label, key, options):
     assert wait_for(ended)
     held = [path for path in glob.glob("/run/**", recursive=True)
             if os.path.isfile(path) and key.encode() in read(path)]
-    for pid in supplicants() + machine.numbers("followers"):
-        os.kill(pid, 9)
-    tracer.join()
+    stopped = set()
+
+    # What is slow to begin notes its number after the others.
+    def all_stopped():
+        for pid in {*supplicants(), *machine.numbers("followers")} - stopped:
+            with contextlib.suppress(ProcessLookupError):  # the command has ended it
+                os.kill(pid, signal.SIGKILL)
+            stopped.add(pid)
+        return not tracer.is_alive()
+    assert wait_for(all_stopped)
     lines = [line for line in read(trace).splitlines() if b"exec" in line]
     assert len(lines) > 5
     for secret in (key.encode(), key.encode().hex().encode()):
