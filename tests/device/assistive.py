@@ -6,6 +6,8 @@ import functools
 import subprocess
 import tempfile
 
+from harness import shared_library
+
 SOURCE = r"""
 #include <fcntl.h>
 #include <string.h>
@@ -58,12 +60,9 @@ G_MODULE_EXPORT void gtk_module_init(int *argc, char ***argv)
 @functools.lru_cache(maxsize=None)
 def _library():
     with tempfile.TemporaryDirectory() as directory:
-        with open(f"{directory}/hand.c", "w", encoding="ascii") as file:
-            file.write(SOURCE)
         flags = subprocess.run(["pkg-config", "--cflags", "--libs", "gtk+-2.0", "gmodule-2.0"],
                                check=True, stdout=subprocess.PIPE, text=True).stdout.split()
-        subprocess.run(["cc", "-w", "-shared", "-fPIC", "-o", f"{directory}/hand.so",
-                        f"{directory}/hand.c"] + flags, check=True)
+        shared_library(SOURCE, f"{directory}/hand.so", flags)
         with open(f"{directory}/hand.so", "rb") as file:
             return file.read()
 

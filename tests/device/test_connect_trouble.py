@@ -3,7 +3,6 @@
 
 import os
 import resource
-import subprocess
 
 import pytest
 
@@ -55,13 +54,9 @@ pid_t fork(void)
 def troubled(device, *networks):
     """A device whose program is linked with the library above."""
     d = device("none", rate=50, scan=scan_text(*networks))
-    source, library = f"{d.state}/trouble.c", f"{d.state}/trouble.so"
-    with open(source, "w", encoding="ascii") as file:
-        file.write(LIBRARY)
-    subprocess.run(["cc", "-shared", "-fPIC", "-O1", "-o", library, source], check=True)
     for name in COMMANDS:
         d.command(name, hook=":")
-    app = d.start(environment={"LD_PRELOAD": library})
+    app = d.start(environment=d.preload("trouble", LIBRARY))
     app.wait_listed()
     d.clock.rate = 0
     return d, app

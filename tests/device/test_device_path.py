@@ -3,7 +3,6 @@
 kernel does not tell it, and the kind of a network's key."""
 
 import errno
-import subprocess
 
 from connecting import (CONNECTING, IDLE, INVALID, address_of, arrive, children, connect, idle,
                         pass_time, poll_address, poll_link, preferred, settle, wait_commands)
@@ -223,9 +222,7 @@ NO_RIGHTS = "unsigned geteuid(void) { return 1000; }"
 
 def test_without_the_rights_of_root(device):
     d = device("street")
-    subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-", "-o", f"{d.state}/rights.so"],
-                   input=NO_RIGHTS, text=True, check=True)
-    preload = {"LD_PRELOAD": f"{d.state}/rights.so"}
+    preload = d.preload("rights", NO_RIGHTS)
     app = d.start(environment=preload, device_path=True)
     notice = app.dialog(text="Only an administrator can set the wireless network up.")
     assert d.commands("iwlist") == []

@@ -32,8 +32,6 @@ LOOKS = 12  # without a change
 def fixture_street(shared_device):
     d = shared_device("street", rate=50)
     d.display.move(1023, 767)  # over the list it may bring a tooltip
-    subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-", "-o", f"{d.state}/search.so"],
-                   input=SEARCH, text=True, check=True)
     d.sh(f"mkdir -p {LONE}/icons && cp -R /usr/share/icons/hicolor {LONE}/icons")
     for name in (THEME, "none-of-that-name"):
         d.put(f"{name}.rc", f'gtk-icon-theme-name = "{name}"\n')
@@ -83,7 +81,7 @@ def environment(data, rc):
     pytest.param(SYSTEM, "none-of-that-name", id="one chosen that is missing")])
 def test_the_same_pixels(street, data, rc):
     settings = environment(data, rc)
-    app = street.start(environment={**settings, "LD_PRELOAD": f"{street.state}/search.so"})
+    app = street.start(environment={**settings, **street.preload("search", SEARCH)})
     expected = settled_picture(street, app)
     assert app.quit() == 0
     app = street.start(environment=settings)
@@ -93,7 +91,7 @@ def test_the_same_pixels(street, data, rc):
 
 def directories_read(street, settings):
     """Files of icon themes that a start opens."""
-    app = street.start(environment={**settings, "LD_PRELOAD": f"{street.state}/opened.so"})
+    app = street.start(environment={**settings, **street.preload("opened", OPENED)})
     app.wait_listed()
     app.quit()
     return re.findall(r"^.*icons.*$", street.state_file("opened").decode(), re.M)
@@ -122,8 +120,6 @@ DIR *opendir(const char *name)
 
 
 def test_nothing_is_searched_where_no_theme_is_chosen(street):
-    subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-", "-o", f"{street.state}/opened.so"],
-                   input=OPENED, text=True, check=True)
     # So that the theme's directories have to be read one by one.
     street.sh(f"rm -f {LONE}/icons/hicolor/icon-theme.cache")
     assert directories_read(street, environment(LONE, None)) == []

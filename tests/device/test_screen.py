@@ -3,7 +3,6 @@
 
 import json
 import os
-import subprocess
 
 import pytest
 
@@ -196,11 +195,7 @@ void gdk_window_get_frame_extents(void *window, void *frame)
 
 def test_a_window_that_is_resized_while_it_is_measured(device):
     d = screen(device, (1024, 768), window_manager=False)
-    source, library = f"{d.state}/shrinking.c", f"{d.state}/shrinking.so"
-    with open(source, "w", encoding="ascii") as file:
-        file.write(SHRINKING)
-    subprocess.run(["cc", "-shared", "-fPIC", "-o", library, source], check=True)
-    app = d.start(environment={"LD_PRELOAD": library})
+    app = d.start(environment=d.preload("shrinking", SHRINKING))
     app.wait_listed()
     d.display.turn(800, 480)
     wait_until(lambda: app.tree()["frame"] == [0, 0, 800, 480], lambda: app.tree()["frame"])

@@ -196,10 +196,8 @@ fi
 
 def test_no_memory_for_the_state(device):
     d = device("street")
-    library = f"{d.state}/no-memory.so"
-    subprocess.run(["cc", "-shared", "-fPIC", "-x", "c", "-o", library, "-"], check=True,
-                   input=b"void *g_try_malloc0(unsigned long n) { (void)n; return (void *)0; }")
-    app = d.start(wait=False, environment={"LD_PRELOAD": library})
+    app = d.start(wait=False, environment=d.preload(
+        "memory", "void *g_try_malloc0(unsigned long n) { (void)n; return (void *)0; }"))
     assert app.wait_end() == 0
     assert "WIRELESS-LAN-DEBUG: my_wifi_init error!!!\r\n" in app.stderr()
     assert d.commands() == []

@@ -1,11 +1,10 @@
 # SPDX-License-Identifier: MIT
 """Files that could not be read whole are not written over without asking."""
 
-import subprocess
-
 import pytest
 
 from connecting import OFFER, connect, idle, wait_commands
+from harness import shared_library
 from preferred import FILE, Network, close, file_of, open_list
 from settings_page import CONF, Settings, dhcp
 from test_store import QUESTION
@@ -69,11 +68,9 @@ OLD = file_of(HOME, CAFE)
 
 @pytest.fixture(scope="module")
 def library(tmp_path_factory):
-    folder = tmp_path_factory.mktemp("fault")
-    (folder / "fault.c").write_text(LIBRARY, encoding="ascii")
-    subprocess.run(["cc", "-w", "-shared", "-fPIC", "-o", f"{folder}/fault.so",
-                    f"{folder}/fault.c"], check=True)
-    return (folder / "fault.so").read_bytes()
+    path = tmp_path_factory.mktemp("fault") / "fault.so"
+    shared_library(LIBRARY, path)
+    return path.read_bytes()
 
 
 def faulty(device, library, path, reason, offset, files):

@@ -3,6 +3,6 @@
 
 from probe import wait_until
 
-from .device import CATALOGUES, TOP, Device
+from .device import CATALOGUES, TOP, Device, shared_library
 
-__all__ = ["CATALOGUES", "Device", "TOP", "wait_until"]
+__all__ = ["CATALOGUES", "Device", "TOP", "shared_library", "wait_until"]

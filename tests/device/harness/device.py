@@ -52,6 +52,12 @@ def built():
     return directory
 
 
+def shared_library(source, path, flags=()):
+    """Compiles C (text) into a library at `path` that a program can be made to load."""
+    subprocess.run(["cc", "-w", "-O1", "-shared", "-fPIC", "-x", "c", "-", "-o", path, *flags],
+                   check=True, input=source, text=True)
+
+
 class Device:
     def __init__(self, scenario="street", rate=None, files=None, interfaces=None, scan=None,
                  size="1024x768", window_manager=True):
@@ -147,6 +153,13 @@ class Device:
         if wait:
             app.wait(60)
         return app
+
+    def preload(self, name, source):
+        """The environment of a program that finds the functions of this C source before its
+        own libraries'."""
+        library = f"{self.state}/{name}.so"
+        shared_library(source, library)
+        return {"LD_PRELOAD": library}
 
     def probe_path(self, number):
         return f"{self.state}/probe.{number}"
