@@ -4,7 +4,6 @@ action, which a dialog in front does not keep away as it does the pointer."""
 
 import functools
 import subprocess
-import tempfile
 
 from harness import shared_library
 
@@ -59,12 +58,9 @@ G_MODULE_EXPORT void gtk_module_init(int *argc, char ***argv)
 
 @functools.lru_cache(maxsize=None)
 def _library():
-    with tempfile.TemporaryDirectory() as directory:
-        flags = subprocess.run(["pkg-config", "--cflags", "--libs", "gtk+-2.0", "gmodule-2.0"],
-                               check=True, stdout=subprocess.PIPE, text=True).stdout.split()
-        shared_library(SOURCE, f"{directory}/hand.so", flags)
-        with open(f"{directory}/hand.so", "rb") as file:
-            return file.read()
+    flags = subprocess.run(["pkg-config", "--cflags", "--libs", "gtk+-2.0", "gmodule-2.0"],
+                           check=True, stdout=subprocess.PIPE, text=True).stdout.split()
+    return shared_library(SOURCE, *flags)
 
 
 def settings(**others):

@@ -66,17 +66,10 @@ CAFE = Network("cafe", enc="open", key="cafe-key")
 OLD = file_of(HOME, CAFE)
 
 
-@pytest.fixture(scope="module")
-def library(tmp_path_factory):
-    path = tmp_path_factory.mktemp("fault") / "fault.so"
-    shared_library(LIBRARY, path)
-    return path.read_bytes()
-
-
-def faulty(device, library, path, reason, offset, files):
+def faulty(device, path, reason, offset, files):
     """A device whose program meets the fault at its start, and no more behind it."""
     d, app = idle(device, "bar", ("attic", "on"),
-                  files={"/fault.so": library, **files,
+                  files={"/fault.so": shared_library(LIBRARY), **files,
                          "/device/state/fault": f"{path} {reason} {offset}\n".encode()},
                   environment={"LD_PRELOAD": "/fault.so"})
     d.sh("rm /device/state/fault")
@@ -89,8 +82,8 @@ def faulty(device, library, path, reason, offset, files):
     # In the middle of the second network: without its key.
     (EIO, OLD.index(b"KEY cafe-key"), [HOME, CAFE._replace(key="")])],
     ids=["no descriptor", "no open", "no byte", "one network", "a key"])
-def test_remembering_a_network_loses_none(device, library, reason, offset, known):
-    d, app = faulty(device, library, FILE, reason, offset, {FILE: OLD})
+def test_remembering_a_network_loses_none(device, reason, offset, known):
+    d, app = faulty(device, FILE, reason, offset, {FILE: OLD})
     if offset < 0:
         assert f"Could not access file: {FILE}\n" in app.stderr()
     for count, answer in enumerate(("gtk-no", "gtk-yes", None), 1):
@@ -115,9 +108,9 @@ def test_remembering_a_network_loses_none(device, library, reason, offset, known
             app.text("title-label")
 
 
-def test_the_settings(device, library):
+def test_the_settings(device):
     before = dhcp(essid="board", key="old-key").encode()
-    d, app = faulty(device, library, CONF, EIO, before.index(b"KEY"), {CONF: before})
+    d, app = faulty(device, CONF, EIO, before.index(b"KEY"), {CONF: before})
     # The dialog reads them again, whole this time: nobody is asked.
     Settings(app).ok()
     assert d.file(CONF) == before and d.file(CONF + ".old") is None
@@ -140,8 +133,8 @@ def test_the_settings(device, library):
     assert app.dialogs() == []
 
 
-def test_an_old_file_that_cannot_be_kept(device, library):
-    d, app = faulty(device, library, FILE, EMFILE, -1, {FILE: OLD})
+def test_an_old_file_that_cannot_be_kept(device):
+    d, app = faulty(device, FILE, EMFILE, -1, {FILE: OLD})
     d.sh(f"mkdir {FILE}.old")
     dialog = open_list(app)
     dialog.press("gtk-ok")

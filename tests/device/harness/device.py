@@ -52,10 +52,15 @@ def built():
     return directory
 
 
-def shared_library(source, path, flags=()):
-    """Compiles C (text) into a library at `path` that a program can be made to load."""
-    subprocess.run(["cc", "-w", "-O1", "-shared", "-fPIC", "-x", "c", "-", "-o", path, *flags],
-                   check=True, input=source, text=True)
+@functools.cache
+def shared_library(source, *flags):
+    """What C (text) compiles to: the bytes of a library that a program can be made to load."""
+    with tempfile.TemporaryDirectory() as directory:
+        path = f"{directory}/library.so"
+        subprocess.run(["cc", "-w", "-O1", "-shared", "-fPIC", "-x", "c", "-", "-o", path, *flags],
+                       check=True, input=source, text=True)
+        with open(path, "rb") as file:
+            return file.read()
 
 
 class Device:
@@ -157,9 +162,8 @@ class Device:
     def preload(self, name, source):
         """The environment of a program that finds the functions of this C source before its
         own libraries'."""
-        library = f"{self.state}/{name}.so"
-        shared_library(source, library)
-        return {"LD_PRELOAD": library}
+        self.put(f"{name}.so", shared_library(source))
+        return {"LD_PRELOAD": f"{self.state}/{name}.so"}
 
     def probe_path(self, number):
         return f"{self.state}/probe.{number}"
