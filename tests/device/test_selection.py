@@ -24,8 +24,7 @@ def selections(app):
 
 def press_below(app):
     """A press in the list, below its last row."""
-    x, y, width, height = app.find("view-press")["rect"]
-    app.display.click(x + width // 2, y + height - 10)
+    app.click("view-press", at=(1 / 2, 0.95))
 
 
 def wait_selections(app, count):
@@ -137,7 +136,6 @@ def test_presses_that_cannot_select(device):
     app.press("button-refresh")
     app.dialog(text="No Wireless Device").press("gtk-close")
     settle(app)
-    x, y, width, height = app.find("view-press")["rect"]
-    app.display.click(x + width // 2, y + height // 2)
+    app.click("view-press")
     app.wait_printed("'my_wifi->cell_count>0&&my_wifi->interface_count>0' failed\n", 2)
     assert app.running() and d.commands("iwset") == []

@@ -145,8 +145,9 @@ class Pane:
         can be clicked."""
         self.click(lambda: self._button(what), what, limit=limit)
 
-    def click(self, what, description=None, button=1, count=1, limit=LIMIT):
-        """Clicks in the middle of a widget: its name, its record, or a function that finds it."""
+    def click(self, what, description=None, button=1, count=1, limit=LIMIT, at=(1 / 2, 1 / 2)):
+        """Clicks into a widget: its name, its record, or a function that finds it. `at`: how far
+        from its left and upper edge, in parts of its width and height."""
         def found():
             if callable(what):
                 return what()
@@ -161,7 +162,7 @@ class Pane:
         if self._scroll_to(found, widget):
             widget = in_place()
         x, y, width, height = widget["rect"]
-        self.app.display.click(x + width // 2, y + height // 2, button, count)
+        self.app.display.click(x + width * at[0], y + height * at[1], button, count)
         return widget
 
     def _now(self, widget):
