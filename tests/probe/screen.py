@@ -100,6 +100,18 @@ class Screen:
         wait_until(lambda: self.root.get_full_property(running, X.AnyPropertyType),
                    "the window manager did not start")
 
+    def wait_window_manager_done(self):
+        """Until it has done what it was asked for before: it reads its events in order and answers
+        a request for the frame of a window (Extended Window Manager Hints)."""
+        window = self.root.create_window(-1, -1, 1, 1, 0, X.CopyFromParent)
+        frame = self._x.intern_atom("_NET_FRAME_EXTENTS")
+        self.root.send_event(event.ClientMessage(
+            window=window, client_type=self._x.intern_atom("_NET_REQUEST_FRAME_EXTENTS"),
+            data=(32, [0] * 5)), X.SubstructureNotifyMask | X.SubstructureRedirectMask)
+        wait_until(lambda: window.get_full_property(frame, X.AnyPropertyType),
+                   "an answer of the window manager")
+        window.destroy()
+
     def turn(self, width, height):
         """Gives the screen another size while everything runs; no larger than it was at first."""
         resources = self.root.xrandr_get_screen_resources()

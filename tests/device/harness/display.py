@@ -7,9 +7,8 @@ import signal
 import subprocess
 
 from Xlib import X
-from Xlib.protocol import event
 
-from probe import Screen, wait_until
+from probe import Screen
 from support.png import save_png
 
 WINDOW_MANAGERS = {True: ["openbox", "--sm-disable"], "blackbox": ["blackbox"]}
@@ -50,18 +49,6 @@ class Display(Screen):
             yield
         finally:
             manager.send_signal(signal.SIGCONT)
-
-    def wait_window_manager_done(self):
-        """Until it has done what it was asked for before: it reads its events in order and answers
-        a request for the frame of a window (Extended Window Manager Hints)."""
-        window = self.root.create_window(-1, -1, 1, 1, 0, X.CopyFromParent)
-        frame = self._x.intern_atom("_NET_FRAME_EXTENTS")
-        self.root.send_event(event.ClientMessage(
-            window=window, client_type=self._x.intern_atom("_NET_REQUEST_FRAME_EXTENTS"),
-            data=(32, [0] * 5)), X.SubstructureNotifyMask | X.SubstructureRedirectMask)
-        wait_until(lambda: window.get_full_property(frame, X.AnyPropertyType),
-                   "an answer of the window manager")
-        window.destroy()
 
     def screenshot(self, path):
         """Saves what the screen shows as a PNG file; gives the path."""
