@@ -1,10 +1,8 @@
 # SPDX-License-Identifier: MIT
 """The list of preferred networks: its dialog, the order, deletion, OK and Cancel."""
 
-import contextlib
 import os
 import subprocess
-import threading
 
 import assistive
 from harness import wait_until
@@ -111,13 +109,10 @@ def test_presses_that_a_window_manager_holds_back_keep_their_places(device):
     d, app = start(device, HOME, CAFE)
     dialog = open_list(app)
     places = [dialog.find(f"preferred_button_{what}")["rect"] for what in ("delete", "properties")]
-    with contextlib.ExitStack() as stack:
-        stack.enter_context(d.display.window_manager_asleep())
-        awake = threading.Timer(0.5, stack.close)
-        awake.start()
+    with d.display.window_manager_asleep() as wake_after:
+        wake_after(0.5)
         for x, y, *_ in places + [dialog.cell(FRONT, 0, 0)]:
             d.display.click(x + 10, y + 5)
-        awake.join()
     wait_until(lambda: dialog.selected(FRONT) == [0], "the first row to be selected")
     assert app.stderr().count("select row") == 1
     close(dialog, "gtk-cancel")

@@ -6,6 +6,7 @@ import re
 from connecting import (CONNECTING, IDLE, address_of, arrive, connect, connected, idle, pass_time,
                         poll_link, refresh, settle, wait_commands)
 from harness import wait_until
+from support.grammar import scan_text
 
 
 def presses(app):
@@ -105,6 +106,17 @@ def test_double_click_connects_unless_a_connect_runs(device):
     assert app.sensitive("button-connect")
     connect(app, 1)
     wait_commands(d, app, 3)
+
+
+def test_a_press_while_a_busy_window_manager_has_not_shown_the_window(device):
+    d = device("none", rate=50, scan=scan_text("one"))
+    with d.display.window_manager_asleep() as wake_after:
+        app = d.start()
+        app.wait_listed()
+        wake_after(1.5)
+        app.click_row("view-press", 0)
+        wait_selections(app, 1)
+    assert app.selected("view-press") == [0]
 
 
 def test_presses_that_cannot_select(device):

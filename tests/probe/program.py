@@ -205,15 +205,19 @@ class Pane:
     def _in_place(self, find, place, what, limit=LIMIT):
         """The widget, once it can be used, its window is in front, and its place is the same twice
         running: not about to be moved by the window manager. When two dialogs go at once it may
-        leave no window active: then the press is what brings this one to the front."""
+        have left no window active: then the press is what brings this one to the front."""
         last = []
         left_alone = [0]
 
         def in_front():
             if self.tree().get("active", True):
                 return True
-            nobody = not any(one.get("active") for one in self.app.windows())
-            left_alone[0] = left_alone[0] + 1 if nobody else 0
+            if any(one.get("active") for one in self.app.windows()):
+                left_alone[0] = 0
+                return False
+            if left_alone[0] == 0:
+                self.app.display.wait_window_manager_done()
+            left_alone[0] += 1
             return left_alone[0] >= 20
 
         def ready():

@@ -102,12 +102,17 @@ class Screen:
 
     def wait_window_manager_done(self):
         """Until it has done what it was asked for before: it reads its events in order and answers
-        a request for the frame of a window (Extended Window Manager Hints)."""
+        a request for the frame of a window (Extended Window Manager Hints). Nothing where none
+        runs, or one that knows no such request."""
+        request = self._x.intern_atom("_NET_REQUEST_FRAME_EXTENTS")
+        known = self.root.get_full_property(self._x.intern_atom("_NET_SUPPORTED"), Xatom.ATOM)
+        if known is None or request not in known.value:
+            return
         window = self.root.create_window(-1, -1, 1, 1, 0, X.CopyFromParent)
         frame = self._x.intern_atom("_NET_FRAME_EXTENTS")
         self.root.send_event(event.ClientMessage(
-            window=window, client_type=self._x.intern_atom("_NET_REQUEST_FRAME_EXTENTS"),
-            data=(32, [0] * 5)), X.SubstructureNotifyMask | X.SubstructureRedirectMask)
+            window=window, client_type=request, data=(32, [0] * 5)),
+            X.SubstructureNotifyMask | X.SubstructureRedirectMask)
         wait_until(lambda: window.get_full_property(frame, X.AnyPropertyType),
                    "an answer of the window manager")
         window.destroy()

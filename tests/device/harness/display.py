@@ -5,6 +5,7 @@ import contextlib
 import os
 import signal
 import subprocess
+import threading
 
 from Xlib import X
 
@@ -42,12 +43,21 @@ class Display(Screen):
 
     @contextlib.contextmanager
     def window_manager_asleep(self):
-        """Stops it; its events are handled when it goes on."""
+        """Stops it; its events are handled when it goes on: at the end, or before it, a number of
+        seconds after the function that this gives has been called with that number."""
         manager = self._processes[1]
+        timers = []
+
+        def wake_after(seconds):
+            timers.append(threading.Timer(seconds, manager.send_signal, [signal.SIGCONT]))
+            timers[-1].start()
+
         manager.send_signal(signal.SIGSTOP)
         try:
-            yield
+            yield wake_after
         finally:
+            for timer in timers:
+                timer.cancel()
             manager.send_signal(signal.SIGCONT)
 
     def screenshot(self, path):
