@@ -96,9 +96,12 @@ class Screen:
         return [self._x.create_resource_object("window", one).get_wm_name() for one in windows]
 
     def wait_window_manager(self):
-        running = self._x.intern_atom("_NET_SUPPORTING_WM_CHECK")
-        wait_until(lambda: self.root.get_full_property(running, X.AnyPropertyType),
-                   "the window manager did not start")
+        """Until it has started, and has done what it was asked for meanwhile."""
+        for name in ("_NET_SUPPORTING_WM_CHECK", "_NET_SUPPORTED"):
+            atom = self._x.intern_atom(name)
+            wait_until(lambda atom=atom: self.root.get_full_property(atom, X.AnyPropertyType),
+                       "the window manager did not start")
+        self.wait_window_manager_done()
 
     def wait_window_manager_done(self):
         """Until it has done what it was asked for before: it reads its events in order and answers
@@ -110,11 +113,19 @@ class Screen:
             return
         window = self.root.create_window(-1, -1, 1, 1, 0, X.CopyFromParent)
         frame = self._x.intern_atom("_NET_FRAME_EXTENTS")
-        self.root.send_event(event.ClientMessage(
-            window=window, client_type=request, data=(32, [0] * 5)),
-            X.SubstructureNotifyMask | X.SubstructureRedirectMask)
-        wait_until(lambda: window.get_full_property(frame, X.AnyPropertyType),
-                   "an answer of the window manager")
+
+        def tell(window, message):
+            self.root.send_event(event.ClientMessage(
+                window=window, client_type=message, data=(32, [0] * 5)),
+                X.SubstructureNotifyMask | X.SubstructureRedirectMask)
+
+        def answered():
+            # Openbox leaves what comes while it starts until the next event: one that it ignores.
+            tell(self.root, frame)
+            return window.get_full_property(frame, X.AnyPropertyType)
+
+        tell(window, request)
+        wait_until(answered, "an answer of the window manager")
         window.destroy()
 
     def turn(self, width, height):
